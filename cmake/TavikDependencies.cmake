@@ -1,0 +1,14 @@
+# Every dependency comes from a Debian package (scripts/install-deps.sh).
+
+find_package(Protobuf REQUIRED)
+find_package(absl CONFIG REQUIRED)
+find_package(fmt CONFIG REQUIRED)
+find_package(Eigen3 CONFIG REQUIRED)
+include(FindAndroidBase)
+
+if(TAVIK_BUILD_TESTS)
+  find_package(GTest CONFIG REQUIRED)
+endif()
+if(TAVIK_BUILD_BENCHMARKS)
+  find_package(benchmark CONFIG REQUIRED)
+endif()

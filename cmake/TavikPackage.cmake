@@ -1,0 +1,1 @@
+# Installation: headers, libraries, the CMake package `tavik` and a pkg-config file.

@@ -1,0 +1,21 @@
+# Tests: GoogleTest executables registered with CTest, one per directory of units so that the
+# link count stays small.
+
+if(TAVIK_BUILD_TESTS)
+  enable_testing()
+  include(GoogleTest)
+endif()
+
+# tavik_add_test(NAME <name> SOURCES <files...> LIBRARIES <targets...>)
+function(tavik_add_test)
+  if(NOT TAVIK_BUILD_TESTS)
+    return()
+  endif()
+  cmake_parse_arguments(ARG "" "NAME" "SOURCES;LIBRARIES" ${ARGN})
+  add_executable(${ARG_NAME} ${ARG_SOURCES})
+  tavik_target_warnings(${ARG_NAME})
+  target_link_libraries(${ARG_NAME} PRIVATE ${ARG_LIBRARIES} tavik_base_testing
+                        GTest::gmock GTest::gtest_main)
+  gtest_discover_tests(${ARG_NAME} DISCOVERY_MODE PRE_TEST
+                       PROPERTIES ENVIRONMENT "TAVIK_SOURCE_DIR=${PROJECT_SOURCE_DIR}")
+endfunction()

@@ -1,0 +1,7 @@
+#include "tavik/iq/version.h"
+
+namespace tavik {
+
+std::string_view LibraryVersion() { return TAVIK_VERSION; }
+
+}  // namespace tavik
