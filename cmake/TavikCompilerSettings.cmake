@@ -11,6 +11,13 @@ if(TAVIK_WERROR)
   list(APPEND TAVIK_WARNING_FLAGS -Werror)
 endif()
 
+if(TAVIK_BUILD_FUZZERS)
+  # Fuzzing builds everything with coverage for libFuzzer and with the sanitizers that turn bad
+  # input into findings.
+  set(TAVIK_SANITIZE "address")
+  add_compile_options(-fsanitize=fuzzer-no-link)
+endif()
+
 if(TAVIK_SANITIZE STREQUAL "address")
   add_compile_options(-fsanitize=address,undefined -fno-sanitize-recover=undefined
                       -fno-omit-frame-pointer)
@@ -25,4 +32,11 @@ endif()
 # Applies the tree's warning flags to a target of our own code.
 function(tavik_target_warnings target)
   target_compile_options(${target} PRIVATE ${TAVIK_WARNING_FLAGS})
+endfunction()
+
+# Links the whole static archive of the library into `target`. Tools and tests find schemas by
+# name at run time (Any type URLs, text format), so every generated file must be linked in, even
+# those that no code of theirs refers to.
+function(tavik_link_whole_library target)
+  target_link_libraries(${target} PRIVATE "$<LINK_LIBRARY:WHOLE_ARCHIVE,tavik_iq_zel_static>")
 endfunction()

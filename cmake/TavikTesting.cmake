@@ -6,16 +6,20 @@ if(TAVIK_BUILD_TESTS)
   include(GoogleTest)
 endif()
 
-# tavik_add_test(NAME <name> SOURCES <files...> LIBRARIES <targets...>)
+# tavik_add_test(NAME <name> SOURCES <files...> [LIBRARIES <targets...>] [WHOLE_LIBRARY])
+# WHOLE_LIBRARY links all of the static library, for tests that find schemas by name.
 function(tavik_add_test)
   if(NOT TAVIK_BUILD_TESTS)
     return()
   endif()
-  cmake_parse_arguments(ARG "" "NAME" "SOURCES;LIBRARIES" ${ARGN})
+  cmake_parse_arguments(ARG "WHOLE_LIBRARY" "NAME" "SOURCES;LIBRARIES" ${ARGN})
   add_executable(${ARG_NAME} ${ARG_SOURCES})
   tavik_target_warnings(${ARG_NAME})
   target_link_libraries(${ARG_NAME} PRIVATE ${ARG_LIBRARIES} tavik_base_testing
                         GTest::gmock GTest::gtest_main)
+  if(ARG_WHOLE_LIBRARY)
+    tavik_link_whole_library(${ARG_NAME})
+  endif()
   gtest_discover_tests(${ARG_NAME} DISCOVERY_MODE PRE_TEST
                        PROPERTIES ENVIRONMENT "TAVIK_SOURCE_DIR=${PROJECT_SOURCE_DIR}")
 endfunction()

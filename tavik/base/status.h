@@ -4,7 +4,7 @@
 #define TAVIK_BASE_STATUS_H_
 
 #include <optional>
-#include <source_location>
+#include <cstdint>
 #include <sstream>
 #include <string>
 #include <utility>
@@ -20,7 +20,25 @@ using StatusCode = absl::StatusCode;
 template <typename T>
 using StatusOr = absl::StatusOr<T>;
 
-using SourceLocation = std::source_location;
+// Where a failure was made. A default argument of `current()` takes the caller's file and line.
+// (std::source_location would do, but clang 14, which builds the fuzzers, lacks its builtin.)
+class SourceLocation {
+ public:
+  static constexpr SourceLocation current(const char* file_name = __builtin_FILE(),
+                                          uint32_t line = __builtin_LINE()) {
+    return SourceLocation(file_name, line);
+  }
+
+  constexpr const char* file_name() const { return file_name_; }
+  constexpr uint32_t line() const { return line_; }
+
+ private:
+  constexpr SourceLocation(const char* file_name, uint32_t line)
+      : file_name_(file_name), line_(line) {}
+
+  const char* file_name_;
+  uint32_t line_;
+};
 
 using absl::OkStatus;
 

@@ -1,0 +1,124 @@
+// tavik-tune: the tuning engineer's tool for tuning files.
+//
+//   tavik-tune compile IN.textproto -o OUT.binarypb
+//   tavik-tune print FILE.binarypb
+//
+// Every verb answers --help. Exit status: 0 on success, 1 when the verb failed, 2 on a usage
+// error.
+#include <cstring>
+#include <iostream>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "tools/tavik-tune/proto_files.h"
+
+namespace tavik::tune {
+namespace {
+
+constexpr int kExitOk = 0;
+constexpr int kExitFailure = 1;
+constexpr int kExitUsage = 2;
+
+struct Verb {
+  const char* name;
+  const char* usage;
+  const char* help;
+  int (*run)(const std::vector<std::string>& args);
+};
+
+bool WantsHelp(const std::vector<std::string>& args) {
+  for (const std::string& arg : args) {
+    if (arg == "--help" || arg == "-h") return true;
+  }
+  return false;
+}
+
+int Fail(const Status& status) {
+  std::cerr << "tavik-tune: " << status.message() << "\n";
+  return kExitFailure;
+}
+
+int RunCompile(const std::vector<std::string>& args) {
+  std::string input;
+  std::string output;
+  for (size_t i = 0; i < args.size(); ++i) {
+    if (args[i] == "-o" && i + 1 < args.size()) {
+      output = args[++i];
+    } else if (input.empty() && !args[i].empty() && args[i][0] != '-') {
+      input = args[i];
+    } else {
+      std::cerr << "tavik-tune compile: unexpected argument '" << args[i] << "'\n";
+      return kExitUsage;
+    }
+  }
+  if (input.empty() || output.empty()) {
+    std::cerr << "usage: tavik-tune compile IN.textproto -o OUT.binarypb\n";
+    return kExitUsage;
+  }
+  auto message = NewMessageForPath(input);
+  if (Status status = ParseTextFile(input, *message); !status.ok()) return Fail(status);
+  std::string bytes;
+  if (!message->SerializeToString(&bytes)) {
+    return Fail(InternalError(input + ": cannot serialise"));
+  }
+  if (Status status = WriteStringToFile(output, bytes); !status.ok()) return Fail(status);
+  return kExitOk;
+}
+
+int RunPrint(const std::vector<std::string>& args) {
+  if (args.size() != 1 || args[0].empty() || args[0][0] == '-') {
+    std::cerr << "usage: tavik-tune print FILE.binarypb\n";
+    return kExitUsage;
+  }
+  auto message = NewMessageForPath(args[0]);
+  if (Status status = ParseBinaryFile(args[0], *message); !status.ok()) return Fail(status);
+  std::cout << ToText(*message);
+  return kExitOk;
+}
+
+const Verb kVerbs[] = {
+    {"compile", "compile IN.textproto -o OUT.binarypb",
+     "Compiles a tuning file from protobuf text to binary. A path containing\n"
+     "\"golden_sensor_factory_calibration_data\" holds a GoldenSensorFactoryCalibrationData,\n"
+     "any other a TuningUsecaseData. Any fields are written in expanded form:\n"
+     "  [type.googleapis.com/vosbrine.zelmondrake.TuningTreeSet] { ... }\n",
+     RunCompile},
+    {"print", "print FILE.binarypb",
+     "Prints a binary tuning file as protobuf text, with Any fields expanded.\n", RunPrint},
+};
+
+void PrintUsage(std::ostream& out) {
+  out << "usage: tavik-tune VERB [ARGS...]\n\nVerbs:\n";
+  for (const Verb& verb : kVerbs) out << "  " << verb.usage << "\n";
+  out << "\nRun 'tavik-tune VERB --help' for a verb's details.\n";
+}
+
+int Main(int argc, char** argv) {
+  if (argc < 2) {
+    PrintUsage(std::cerr);
+    return kExitUsage;
+  }
+  const std::string_view verb_name = argv[1];
+  if (verb_name == "--help" || verb_name == "-h" || verb_name == "help") {
+    PrintUsage(std::cout);
+    return kExitOk;
+  }
+  const std::vector<std::string> args(argv + 2, argv + argc);
+  for (const Verb& verb : kVerbs) {
+    if (verb_name != verb.name) continue;
+    if (WantsHelp(args)) {
+      std::cout << "usage: tavik-tune " << verb.usage << "\n\n" << verb.help;
+      return kExitOk;
+    }
+    return verb.run(args);
+  }
+  std::cerr << "tavik-tune: unknown verb '" << verb_name << "'\n";
+  PrintUsage(std::cerr);
+  return kExitUsage;
+}
+
+}  // namespace
+}  // namespace tavik::tune
+
+int main(int argc, char** argv) { return tavik::tune::Main(argc, argv); }
