@@ -37,6 +37,8 @@ endfunction()
 # Links the whole static archive of the library into `target`. Tools and tests find schemas by
 # name at run time (Any type URLs, text format), so every generated file must be linked in, even
 # those that no code of theirs refers to.
+# Libraries of ours that build on the static archive link tavik_iq_zel_whole (defined beside the
+# library) for the same reason, so that the archive is always linked the one way.
 function(tavik_link_whole_library target)
-  target_link_libraries(${target} PRIVATE "$<LINK_LIBRARY:WHOLE_ARCHIVE,tavik_iq_zel_static>")
+  target_link_libraries(${target} PRIVATE tavik_iq_zel_whole)
 endfunction()

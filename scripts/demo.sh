@@ -9,7 +9,7 @@ build=build
 cmake -S . -B "$build" -G Ninja -DCMAKE_BUILD_TYPE=RelWithDebInfo > /dev/null
 cmake --build "$build" --target tavik-tune tavik_sample_tuning > /dev/null
 
-tuning="$build/tuning"
+tuning="$build/share/tavik/tuning"
 echo "Sample tuning set ($tuning):"
 ls -1 "$tuning"/*.binarypb | sed 's|^|  |'
 echo

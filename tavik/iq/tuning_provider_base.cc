@@ -46,14 +46,6 @@ std::string EnumName(const google::protobuf::EnumDescriptor* type, int number) {
   return value == nullptr ? std::string() : value->name();
 }
 
-// "BRIMAL_REAR_GN1_NORMAL, FULL_4_3_FULL_15_30FPS, VIEWFINDER". Sensor first, then mode, so that
-// the nearest key in sort order stays on the same sensor and mode where it can.
-std::string EncodeUsecaseKey(const TuningUsecase& usecase) {
-  return StrCat(EnumName(CameraSensor_descriptor(), usecase.camera_sensor()), ", ",
-                EnumName(SensorMode_descriptor(), usecase.sensor_mode()), ", ",
-                EnumName(CameraUsecase_descriptor(), usecase.camera_usecase()));
-}
-
 // Takes one field name, not a path. Null (logged) when the field is absent or is no message.
 const FieldDescriptor* FindMessageField(const Message& message, const std::string& name) {
   const FieldDescriptor* field = message.GetDescriptor()->FindFieldByName(name);
@@ -103,6 +95,12 @@ Status UnpackFirstLeaf(const Level& top_level, Message* out) {
 }
 
 }  // namespace
+
+std::string EncodeUsecaseKey(const TuningUsecase& usecase) {
+  return StrCat(EnumName(CameraSensor_descriptor(), usecase.camera_sensor()), ", ",
+                EnumName(SensorMode_descriptor(), usecase.sensor_mode()), ", ",
+                EnumName(CameraUsecase_descriptor(), usecase.camera_usecase()));
+}
 
 std::string FieldNameFromMessageName(std::string_view name) {
   const size_t dot = name.rfind('.');

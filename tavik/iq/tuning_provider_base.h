@@ -39,6 +39,11 @@ using TuningForestMap = std::map<std::string, std::shared_ptr<google::protobuf::
 // "vosbrine.zelmondrake.GtnrSharpenerTuning" gives "gtnr_sharpener".
 TAVIK_EXPORT std::string FieldNameFromMessageName(std::string_view name);
 
+// The forest's key of a use case: "BRIMAL_REAR_GN1_NORMAL, FULL_4_3_FULL_15_30FPS, VIEWFINDER".
+// Sensor first, then mode, so that the nearest key in sort order stays on the same sensor and mode
+// where it can. An unknown enum number gives an empty name.
+TAVIK_EXPORT std::string EncodeUsecaseKey(const TuningUsecase& usecase);
+
 class TAVIK_EXPORT TuningProviderBase {
  public:
   virtual ~TuningProviderBase() = default;

@@ -2,15 +2,22 @@
 //
 //   tavik-tune compile IN.textproto -o OUT.binarypb
 //   tavik-tune print FILE.binarypb
+//   tavik-tune lint FILE_OR_DIR...
+//   tavik-tune eval DIR --sensor S --mode M --usecase U [--cct X ...] [--block NAME ...]
+//   tavik-tune keys DIR...
 //
 // Every verb answers --help. Exit status: 0 on success, 1 when the verb failed, 2 on a usage
 // error.
-#include <cstring>
+#include <cstdlib>
 #include <iostream>
 #include <string>
 #include <string_view>
 #include <vector>
 
+#include "android-base/logging.h"
+#include "tools/tavik-tune/eval.h"
+#include "tools/tavik-tune/keys.h"
+#include "tools/tavik-tune/lint.h"
 #include "tools/tavik-tune/proto_files.h"
 
 namespace tavik::tune {
@@ -77,6 +84,35 @@ int RunPrint(const std::vector<std::string>& args) {
   return kExitOk;
 }
 
+int RunLint(const std::vector<std::string>& args) {
+  if (args.empty()) {
+    std::cerr << "usage: tavik-tune lint FILE_OR_DIR...\n";
+    return kExitUsage;
+  }
+  const std::vector<LintFinding> findings = LintPaths(args);
+  for (const LintFinding& finding : findings) std::cout << finding.ToString() << "\n";
+  return findings.empty() ? kExitOk : kExitFailure;
+}
+
+int RunEvalVerb(const std::vector<std::string>& args) {
+  StatusOr<EvalRequest> request = ParseEvalArgs(args);
+  if (!request.ok()) {
+    std::cerr << "tavik-tune eval: " << request.status().message() << "\n";
+    return kExitUsage;
+  }
+  if (Status status = RunEval(*request, std::cout); !status.ok()) return Fail(status);
+  return kExitOk;
+}
+
+int RunKeysVerb(const std::vector<std::string>& args) {
+  if (args.empty()) {
+    std::cerr << "usage: tavik-tune keys DIR...\n";
+    return kExitUsage;
+  }
+  if (Status status = RunKeys(args, std::cout); !status.ok()) return Fail(status);
+  return kExitOk;
+}
+
 const Verb kVerbs[] = {
     {"compile", "compile IN.textproto -o OUT.binarypb",
      "Compiles a tuning file from protobuf text to binary. A path containing\n"
@@ -86,6 +122,20 @@ const Verb kVerbs[] = {
      RunCompile},
     {"print", "print FILE.binarypb",
      "Prints a binary tuning file as protobuf text, with Any fields expanded.\n", RunPrint},
+    {"lint", "lint FILE_OR_DIR...",
+     "Finds what the runtime would get wrong or fail on: regions not ascending by upper,\n"
+     "lower > upper, overlapping regions, UNKNOWN or out-of-range level types, empty levels,\n"
+     "nodes with neither child nor leaf, leaves or static_param of the wrong type, type URLs\n"
+     "without the full name, repeated float fields whose lengths differ between the leaves of\n"
+     "a tree, missing trees, duplicate use-case keys across files, files that aren't .binarypb.\n"
+     "One line per finding: FILE: BLOCK: PATH: PROBLEM. Exit status 1 when anything is found.\n",
+     RunLint},
+    {"eval", "eval DIR --sensor S --mode M --usecase U [--cct X ...] [--block NAME ...]",
+     kEvalHelp, RunEvalVerb},
+    {"keys", "keys DIR...",
+     "Prints the forest's keys in sort order, each with the file that won it, and the files\n"
+     "that a key dropped because another file with the same key was read first.\n",
+     RunKeysVerb},
 };
 
 void PrintUsage(std::ostream& out) {
@@ -94,7 +144,24 @@ void PrintUsage(std::ostream& out) {
   out << "\nRun 'tavik-tune VERB --help' for a verb's details.\n";
 }
 
+// The library's log lines go to stderr as "tavik-tune: <severity>: <message>"; below warnings
+// only with TAVIK_TUNE_VERBOSE set.
+void SetUpLogging() {
+  android::base::SetMinimumLogSeverity(std::getenv("TAVIK_TUNE_VERBOSE") != nullptr
+                                           ? android::base::VERBOSE
+                                           : android::base::WARNING);
+  android::base::SetLogger([](android::base::LogId, android::base::LogSeverity severity,
+                              const char*, const char*, unsigned int, const char* message) {
+    static constexpr const char* kNames[] = {"verbose", "debug", "info",
+                                             "warning", "error", "fatal"};
+    const int index = static_cast<int>(severity);
+    std::cerr << "tavik-tune: " << (index >= 0 && index < 6 ? kNames[index] : "log") << ": "
+              << message << "\n";
+  });
+}
+
 int Main(int argc, char** argv) {
+  SetUpLogging();
   if (argc < 2) {
     PrintUsage(std::cerr);
     return kExitUsage;
