@@ -26,7 +26,8 @@ using google::protobuf::FieldDescriptor;
 using google::protobuf::Message;
 
 constexpr char kWholeFile[] = "-";
-constexpr char kTopLevel[] = "top";
+constexpr char kTopLevel[] = "";
+constexpr char kStaticParam[] = "static_param";
 
 std::string FormatFloat(float value) {
   char text[32];
@@ -34,16 +35,20 @@ std::string FormatFloat(float value) {
   return text;
 }
 
-// "CCT#1(3800..4500)": the node at `index` of a level of `type`.
-std::string NodeStep(const vosbrine::Level& level, int index) {
-  const vosbrine::Node& node = level.nodes(index);
-  const std::string type = vosbrine::Level::Type_IsValid(level.type())
-                               ? vosbrine::Level::Type_Name(level.type())
-                               : StrCat("type ", static_cast<int>(level.type()));
-  return StrCat(type, "#", index, "(", FormatFloat(node.lower()), "..", FormatFloat(node.upper()),
-                ")");
+std::string LevelTypeName(const vosbrine::Level& level) {
+  return vosbrine::Level::Type_IsValid(level.type())
+             ? vosbrine::Level::Type_Name(level.type())
+             : StrCat("type ", static_cast<int>(level.type()));
 }
 
+// "CCT#1(3800..4500)": the node at `index` of a level.
+std::string NodeStep(const vosbrine::Level& level, int index) {
+  const vosbrine::Node& node = level.nodes(index);
+  return StrCat(LevelTypeName(level), "#", index, "(", FormatFloat(node.lower()), "..",
+                FormatFloat(node.upper()), ")");
+}
+
+// Paths read from the top level down: "CCT#1(3800..4500) > GAIN#0(1..2)".
 std::string JoinStep(const std::string& path, const std::string& step) {
   return path == kTopLevel ? step : StrCat(path, " > ", step);
 }
@@ -102,10 +107,10 @@ class TreeLinter {
     if (const std::string problem =
             CheckPackedType(tree.static_param(), block_.static_param, "static_param");
         !problem.empty()) {
-      Report(kWholeFile, problem);
+      Report(kStaticParam, problem);
     } else if (!tree.static_param().UnpackTo(
                    std::unique_ptr<Message>(NewMessage(block_.static_param)).get())) {
-      Report(kWholeFile, StrCat("static_param does not parse as ",
+      Report(kStaticParam, StrCat("static_param does not parse as ",
                                 block_.static_param->full_name()));
     }
     if (!tree.has_dynamic_top_level()) {
@@ -125,14 +130,15 @@ class TreeLinter {
   }
 
   void LintLevel(const vosbrine::Level& level, const std::string& path) {
+    const std::string level_path = JoinStep(path, StrCat(LevelTypeName(level), " level"));
     if (level.type() == vosbrine::Level::UNKNOWN) {
-      Report(path, "level type UNKNOWN: evaluation fails");
+      Report(level_path, "level type UNKNOWN: evaluation fails");
     } else if (!vosbrine::Level::Type_IsValid(level.type())) {
-      Report(path, StrCat("level type ", static_cast<int>(level.type()),
-                          " is out of range: evaluation fails"));
+      Report(level_path, StrCat("level type ", static_cast<int>(level.type()),
+                                " is out of range: evaluation fails"));
     }
     if (level.nodes().empty()) {
-      Report(path, "empty level: evaluation fails");
+      Report(level_path, "empty level: evaluation fails");
       return;
     }
     for (int i = 0; i < level.nodes_size(); ++i) {
