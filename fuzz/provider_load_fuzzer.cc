@@ -9,6 +9,7 @@
 #include <string>
 
 #include "android-base/logging.h"
+#include "google/protobuf/stubs/logging.h"
 #include "google/protobuf/message.h"
 #include "tavik/iq/zel/tuning_provider.h"
 #include "tools/tavik-tune/tuning_files.h"
@@ -29,7 +30,9 @@ const std::string& FuzzFilePath() {
 }  // namespace
 
 extern "C" int LLVMFuzzerInitialize(int*, char***) {
+  // Broken input makes the library and protobuf complain on every run; only findings matter.
   android::base::SetMinimumLogSeverity(android::base::FATAL);
+  google::protobuf::SetLogHandler(nullptr);
   return 0;
 }
 

@@ -1,6 +1,7 @@
 #!/usr/bin/env bash
-# The main job on the sample tuning set: builds what is needed, then shows the default use case's
-# tuning as the tuning tool reads it.
+# The main job on the sample tuning set: builds what is needed, then shows what the tuning tool
+# sees in it: the forest's keys, a lint pass, and a few blocks evaluated for a rear-camera frame
+# at a colour temperature between two tuned regions.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -9,10 +10,19 @@ build=build
 cmake -S . -B "$build" -G Ninja -DCMAKE_BUILD_TYPE=RelWithDebInfo > /dev/null
 cmake --build "$build" --target tavik-tune tavik_sample_tuning > /dev/null
 
+tune="$build/tools/tavik-tune"
 tuning="$build/share/tavik/tuning"
-echo "Sample tuning set ($tuning):"
-ls -1 "$tuning"/*.binarypb | sed 's|^|  |'
+
+echo "== Keys of the sample tuning set ($tuning)"
+"$tune" keys "$tuning"
 echo
-default="$tuning/brimal_sensor_bringup_full_4_3_full_15_30fps_viewfinder.binarypb"
-echo "Default use case, as tavik-tune prints it:"
-"$build/tools/tavik-tune" print "$default"
+echo "== Lint"
+"$tune" lint "$tuning" && echo "no findings"
+echo
+echo "== Rear camera viewfinder at 4200 K, gain 6: white balance and black level"
+"$tune" eval "$tuning" --sensor BRIMAL_REAR_GN1_NORMAL --mode FULL_4_3_FULL_15_30FPS \
+  --usecase VIEWFINDER --cct 4200 --gain 6 --block WbTuning --block BlcTuning
+echo
+echo "== A use case with no file of its own falls back to the nearest key"
+"$tune" eval "$tuning" --sensor BRIMAL_REAR_GN1_NORMAL --mode FULL_4_3_FULL_15_30FPS \
+  --usecase VIDEO_RECORDING --cct 4200 --gain 6 --block WbTuning | sed -n 1p
