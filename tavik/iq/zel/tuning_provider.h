@@ -21,6 +21,14 @@ class TAVIK_EXPORT TuningProvider : public TuningProviderBase {
 
   ~TuningProvider() override = default;
 
+  // Rewrites every leaf of the set's shading tree with the tables calibrated by the device's
+  // measurement (a ZelSensorEepromData) against the golden one. Leaves done before a failure stay
+  // calibrated.
+  tavik::Status ApplySensorEepromCalibration(
+      const std::unique_ptr<const SensorEepromData>& eeprom_data,
+      const GoldenSensorFactoryCalibrationData& golden,
+      google::protobuf::Message* tuning_tree_set) const override;
+
  private:
   TuningProvider() = default;
 };
