@@ -6,7 +6,9 @@
 #include "google/protobuf/message.h"
 #include "tavik/base/strings.h"
 #include "tavik/iq/tuning_provider_base.h"
+#include "tavik/iq/zel/sensor_eeprom_data.h"
 #include "tavik/iq/zel/tuning_provider.h"
+#include "tools/common/module_calibration_file.h"
 #include "tools/tavik-tune/proto_files.h"
 
 namespace tavik::tune {
@@ -44,7 +46,10 @@ const char kEvalHelp[] =
     "  --cct, --gain, --bv, --led, --exp-ratio, --scaler-ratio, --mired-cct,\n"
     "  --pre-scaler-ratio, --frame-count, --exposure-time-msecs   coordinates (default 0)\n"
     "  --block NAME   a block by message (GammaTuning) or tree field (gamma); repeatable;\n"
-    "                 all blocks when none is given\n";
+    "                 all blocks when none is given\n"
+    "  --calibration FILE   a device's module calibration (tavik.tools.ModuleCalibrationSet\n"
+    "                 in protobuf text), applied to the shading tuning as on the device\n"
+    "  --device NAME  the device, which names the calibration's sensors (default: none)\n";
 
 StatusOr<EvalRequest> ParseEvalArgs(const std::vector<std::string>& args) {
   EvalRequest request;
@@ -79,6 +84,10 @@ StatusOr<EvalRequest> ParseEvalArgs(const std::vector<std::string>& args) {
       }
       usecase.set_camera_usecase(camera_usecase);
       has_usecase = true;
+    } else if (flag == "calibration") {
+      request.calibration_path = value;
+    } else if (flag == "device") {
+      request.device_name = value;
     } else if (flag == "block") {
       const BlockType* block = FindBlockType(value);
       if (block == nullptr) return InvalidArgumentError(StrCat("unknown block '", value, "'"));
@@ -106,11 +115,22 @@ StatusOr<EvalRequest> ParseEvalArgs(const std::vector<std::string>& args) {
 }
 
 Status RunEval(const EvalRequest& request, std::ostream& out) {
+  std::shared_ptr<vosbrine::SensorEepromDataMap> eeprom_data;
+  if (!request.calibration_path.empty()) {
+    StatusOr<tools::ModuleCalibrationMap> calibration =
+        tools::ReadModuleCalibrationFile(request.calibration_path);
+    if (!calibration.ok()) return calibration.status();
+    eeprom_data = BuildTuningEepromData(request.device_name, *calibration, /*dump=*/false);
+    if (eeprom_data == nullptr) {
+      return InvalidArgumentError(StrCat(request.calibration_path,
+                                         ": no module of a known sensor with a usable grid"));
+    }
+  }
   StatusOr<std::unique_ptr<vosbrine::zelmondrake::TuningProvider>> provider =
       // Directories expanded here, in the runtime's order, so that "." and ".." don't show up
       // as rejected files.
       vosbrine::zelmondrake::TuningProvider::Create(ExpandPaths(request.paths),
-                                                    /*eeprom_data=*/nullptr);
+                                                    eeprom_data.get());
   if (!provider.ok()) return provider.status();
 
   // Production takes the nearest key; say which one it took.

@@ -19,12 +19,16 @@ struct EvalRequest {
   vosbrine::TuningUsecase usecase;
   vosbrine::CameraState state;
   std::vector<const BlockType*> blocks;  // Every block when none is named.
+  // A device's module calibration (tavik.tools.ModuleCalibrationSet in text), applied to the
+  // shading tuning at load as on the device; none when empty.
+  std::string calibration_path;
+  std::string device_name;  // Names the sensors of the calibration: "fennelmoore" or other.
 };
 
 // Parses "DIR --sensor S --mode M --usecase U [--cct X ...] [--block NAME ...]". Coordinates are
 // named after the camera state's fields, with dashes: --cct, --gain (real_gain), --led
 // (led_influence), --bv, --exp-ratio, --mired-cct, --scaler-ratio, --pre-scaler-ratio,
-// --frame-count, --exposure-time-msecs.
+// --frame-count, --exposure-time-msecs; --calibration FILE and --device NAME.
 StatusOr<EvalRequest> ParseEvalArgs(const std::vector<std::string>& args);
 
 // Loads the forest and prints the key used, then each block in text form.
