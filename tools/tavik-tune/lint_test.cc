@@ -107,12 +107,12 @@ TEST(LintTest, MissingTreesAreOneFindingForTheFile) {
   const std::vector<LintFinding> findings = LintPaths({file});
   ASSERT_EQ(findings.size(), 1u);
   EXPECT_EQ(findings[0].ToString(),
-            file + ": -: -: no tree for 24 blocks (CcmTuning, ClutTuning, "
-                   "RgbYuvConversionTuning, DisparityTuning, DmscTuning, DpcTuning, "
-                   "EdgedetTuning, GammaTuning, HqdnsTuning, LtmTuning, LtmDeltaYTuning, "
-                   "LscTuning, LscStatsTuning, NfltrTuning, NsmixTuning, PrcTuning, GtnrTuning, "
-                   "SensorGammaTuning, SnaddTuning, SharpTuning, GtnrSharpenerTuning, "
-                   "SkindTuning, StkTuning, WbTuning): a request for any of them fails");
+            file + ": -: -: no tree for 24 blocks (CcmTuning, ClutTuning, DisparityTuning, "
+                   "DmscTuning, DpcTuning, EdgedetTuning, GammaTuning, GtnrSharpenerTuning, "
+                   "GtnrTuning, HqdnsTuning, LscStatsTuning, LscTuning, LtmTuning, "
+                   "LtmDeltaYTuning, NfltrTuning, NsmixTuning, PrcTuning, "
+                   "RgbYuvConversionTuning, SensorGammaTuning, SharpTuning, SkindTuning, "
+                   "SnaddTuning, StkTuning, WbTuning): a request for any of them fails");
 }
 
 TEST(LintTest, DuplicateUseCaseKeysAcrossFiles) {

@@ -6,6 +6,7 @@
 #include "tavik/base/file_path.h"
 #include "tavik/iq/tuning_provider_base.h"
 #include "tavik/iq/zel/protos/tuning_tree_set.pb.h"
+#include "tavik/iq/zel/zel_block_list.h"
 #include "tools/tavik-tune/proto_files.h"
 
 namespace tavik::tune {
@@ -40,30 +41,13 @@ const std::vector<BlockType>& AllBlockTypes() {
   static const std::vector<BlockType>* const blocks = [] {
     auto* list = new std::vector<BlockType>();
     const auto* tree_set = vosbrine::zelmondrake::TuningTreeSet::descriptor();
-    const auto* pool = tree_set->file()->pool();
-    for (int i = 0; i < tree_set->field_count(); ++i) {
-      const google::protobuf::FieldDescriptor* field = tree_set->field(i);
-      // The message whose field name this is: "rgb_yuv_conversion" -> RgbYuvConversionTuning.
-      std::string stem;
-      bool capital = true;
-      for (char c : field->name()) {
-        if (c == '_') {
-          capital = true;
-          continue;
-        }
-        stem.push_back(capital && c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c);
-        capital = false;
-      }
-      const std::string package = "vosbrine.zelmondrake.";
-      const auto* message = pool->FindMessageTypeByName(package + stem + "Tuning");
-      if (message == nullptr || vosbrine::FieldNameFromMessageName(message->full_name()) !=
-                                    field->name()) {
-        continue;
-      }
-      list->push_back(BlockType{field, message,
-                                pool->FindMessageTypeByName(package + stem + "StaticParam"),
-                                pool->FindMessageTypeByName(package + stem + "DynamicParam")});
-    }
+    ForEachZelBlockType([&]<size_t Position, typename T>() {
+      list->push_back(BlockType{
+          tree_set->FindFieldByName(vosbrine::FieldNameFromMessageName(T::descriptor()->name())),
+          T::descriptor(),
+          T::descriptor()->FindFieldByName("static_param")->message_type(),
+          T::descriptor()->FindFieldByName("dynamic_param")->message_type()});
+    });
     return list;
   }();
   return *blocks;

@@ -26,7 +26,7 @@ struct BlockType {
   const google::protobuf::Descriptor* dynamic_param;
 };
 
-// Every block of TuningTreeSet, in its declaration order.
+// Every block, in the controller's position order.
 const std::vector<BlockType>& AllBlockTypes();
 
 // The block whose message name ("GammaTuning") or tree field ("gamma") is `name`; null if none.
