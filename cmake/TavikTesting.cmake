@@ -20,6 +20,7 @@ function(tavik_add_test)
   if(ARG_WHOLE_LIBRARY)
     tavik_link_whole_library(${ARG_NAME})
   endif()
-  gtest_discover_tests(${ARG_NAME} DISCOVERY_MODE PRE_TEST
+  # Names read "<executable>.<suite>.<test>", so that a run can pick one executable's tests.
+  gtest_discover_tests(${ARG_NAME} DISCOVERY_MODE PRE_TEST TEST_PREFIX "${ARG_NAME}."
                        PROPERTIES ENVIRONMENT "TAVIK_SOURCE_DIR=${PROJECT_SOURCE_DIR}")
 endfunction()

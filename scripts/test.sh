@@ -4,7 +4,8 @@
 #
 #   scripts/test.sh                      build/ : the normal build, tests, install
 #   scripts/test.sh --sanitize address   build-asan/ : AddressSanitizer + UndefinedBehaviorSanitizer
-#   scripts/test.sh --sanitize thread    build-tsan/ : ThreadSanitizer
+#   scripts/test.sh --sanitize thread    build-tsan/ : ThreadSanitizer, on the tests of the code
+#                                        that threads share (the platform and the controller)
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -12,7 +13,7 @@ sanitize=""
 while [ $# -gt 0 ]; do
   case "$1" in
     --sanitize) sanitize=${2:?--sanitize needs address or thread}; shift 2 ;;
-    -h|--help) sed -n '2,8p' "$0"; exit 0 ;;
+    -h|--help) sed -n '2,9p' "$0"; exit 0 ;;
     *) echo "scripts/test.sh: unknown argument '$1'" >&2; exit 2 ;;
   esac
 done
@@ -29,12 +30,21 @@ esac
 cmake -S . -B "$build" -G Ninja -DCMAKE_BUILD_TYPE=RelWithDebInfo -DTAVIK_WERROR=ON \
   -DTAVIK_SANITIZE="$sanitize" -DTAVIK_BUILD_BENCHMARKS="$benchmarks" \
   -DCMAKE_INSTALL_PREFIX="$PWD/$build/install"
-cmake --build "$build"
+targets=()
+if [ "$sanitize" = thread ]; then
+  targets=(--target tavik_base_test tavik_iq_concurrency_test tavik_sample_tuning)
+fi
+cmake --build "$build" "${targets[@]}"
 
 export ASAN_OPTIONS=${ASAN_OPTIONS:-detect_leaks=1:abort_on_error=1}
 export UBSAN_OPTIONS=${UBSAN_OPTIONS:-print_stacktrace=1:halt_on_error=1}
 export TSAN_OPTIONS=${TSAN_OPTIONS:-halt_on_error=1:second_deadlock_stack=1}
-ctest --test-dir "$build" --output-on-failure --parallel "$(nproc)"
+if [ "$sanitize" = thread ]; then
+  ctest --test-dir "$build" --output-on-failure --parallel "$(nproc)" \
+    --tests-regex '^(tavik_base_test|tavik_iq_concurrency_test)\.'
+else
+  ctest --test-dir "$build" --output-on-failure --parallel "$(nproc)"
+fi
 
 if [ -z "$sanitize" ]; then
   cmake --install "$build" > /dev/null
