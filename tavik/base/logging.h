@@ -97,4 +97,19 @@ struct Voidify {
                             .stream()                                                     \
                         << "Check failed: " #condition " "
 
+// Aborts with "Check failed: <a> <op> <b> (<a>=<value>, <b>=<value>) " when the comparison fails.
+#define TAVIK_CHECK_OP_(op, a, b)                                                              \
+  ((a)op(b)) ? (void)0                                                                         \
+             : ::tavik::log_internal::Voidify() &                                              \
+                   ::tavik::log_internal::LogLine(__FILE__, __LINE__, ::android::base::FATAL)  \
+                           .stream()                                                           \
+                       << "Check failed: " #a " " #op " " #b " (" #a "=" << (a) << ", " #b "=" \
+                       << (b) << ") "
+#define TAVIK_CHECK_EQ(a, b) TAVIK_CHECK_OP_(==, a, b)
+#define TAVIK_CHECK_NE(a, b) TAVIK_CHECK_OP_(!=, a, b)
+#define TAVIK_CHECK_LE(a, b) TAVIK_CHECK_OP_(<=, a, b)
+#define TAVIK_CHECK_LT(a, b) TAVIK_CHECK_OP_(<, a, b)
+#define TAVIK_CHECK_GE(a, b) TAVIK_CHECK_OP_(>=, a, b)
+#define TAVIK_CHECK_GT(a, b) TAVIK_CHECK_OP_(>, a, b)
+
 #endif  // TAVIK_BASE_LOGGING_H_
