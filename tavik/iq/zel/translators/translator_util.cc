@@ -1,0 +1,27 @@
+#include "tavik/iq/zel/translators/translator_util.h"
+
+#include <cmath>
+
+namespace tavik {
+
+int64_t ToFixedPoint(float value, int fractional_bits, int64_t min, int64_t max) {
+  const float scaled = RoundHalfAwayFromZero(value * std::ldexp(1.0f, fractional_bits));
+  // Compared as floats first, so that a value beyond int64's range never reaches a conversion.
+  if (!(scaled > static_cast<float>(min))) return min;
+  if (!(scaled < static_cast<float>(max))) return max;
+  const int64_t code = static_cast<int64_t>(scaled);
+  return code < min ? min : code > max ? max : code;
+}
+
+uint32_t ClutPacking(uint16_t a, uint16_t b, uint16_t c) {
+  const uint32_t high = a;
+  const uint32_t middle = b;
+  const uint32_t low = c;
+  if (high > 1023) return 0xA0000000u | ((high & 0x7F) << 22) | (middle << 11) | low;
+  if (middle < 1024 && low < 1024) return (high << 20) | (middle << 10) | low;
+  if (middle < 1024) return 0xE0000000u | ((low & 0x7F) << 22) | (high << 11) | middle;
+  // The middle component's mask is one bit wider than the others'; the decoder expects it so.
+  return 0xC0000000u | ((middle & 0xFF) << 22) | (high << 11) | low;
+}
+
+}  // namespace tavik
