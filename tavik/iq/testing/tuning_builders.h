@@ -11,8 +11,8 @@
 #include <vector>
 
 #include "google/protobuf/descriptor.h"
-#include "google/protobuf/descriptor_database.h"
 #include "google/protobuf/descriptor.pb.h"
+#include "google/protobuf/descriptor_database.h"
 #include "google/protobuf/dynamic_message.h"
 #include "google/protobuf/message.h"
 #include "google/protobuf/text_format.h"
@@ -67,8 +67,7 @@ inline vosbrine::TuningTree MakeTree(bool enable, const google::protobuf::Messag
   return tree;
 }
 
-inline vosbrine::TuningUsecase MakeUsecase(vosbrine::CameraSensor sensor,
-                                           vosbrine::SensorMode mode,
+inline vosbrine::TuningUsecase MakeUsecase(vosbrine::CameraSensor sensor, vosbrine::SensorMode mode,
                                            vosbrine::CameraUsecase usecase) {
   vosbrine::TuningUsecase result;
   result.set_camera_sensor(sensor);
@@ -135,8 +134,7 @@ class DynamicSchema {
  public:
   explicit DynamicSchema(std::string_view file_descriptor_text) {
     google::protobuf::FileDescriptorProto file;
-    if (!google::protobuf::TextFormat::ParseFromString(std::string(file_descriptor_text),
-                                                       &file)) {
+    if (!google::protobuf::TextFormat::ParseFromString(std::string(file_descriptor_text), &file)) {
       ADD_FAILURE() << "bad FileDescriptorProto text";
       return;
     }
