@@ -32,11 +32,16 @@ class RateLimiter {
   // Against a clock of the caller's, in whole seconds.
   bool ShouldPass(int64_t now_seconds);
 
+  // Makes every limiter of the process let its next event through, as if new. For tests, which
+  // assert the lines of call sites that earlier tests of the same process have used.
+  static void ResetAllForTesting();
+
  private:
   static constexpr int64_t kNever = INT64_MIN;
 
   const int64_t period_seconds_;
   std::atomic<int64_t> last_second_{kNever};
+  std::atomic<uint64_t> generation_{0};
 };
 
 namespace log_internal {

@@ -111,6 +111,28 @@ TEST(RateLimiterTest, PassesOncePerFiveSeconds) {
   EXPECT_TRUE(limiter.ShouldPass(110));
 }
 
+TEST(RateLimiterTest, ResetForTestingLetsTheNextEventThrough) {
+  RateLimiter limiter(5);
+  EXPECT_TRUE(limiter.ShouldPass(100));
+  EXPECT_FALSE(limiter.ShouldPass(101));
+  RateLimiter::ResetAllForTesting();
+  EXPECT_TRUE(limiter.ShouldPass(101));
+  EXPECT_FALSE(limiter.ShouldPass(102));
+}
+
+TEST(LoggingTest, ANewCaptureSeesTheFirstLineOfAnAlreadyUsedCallSite) {
+  auto warn = []() { TAVIK_LOG_EVERY_N_SEC(WARNING, 5) << "per frame"; };
+  {
+    ScopedLogCapture capture;
+    warn();
+    warn();
+    EXPECT_THAT(capture.messages(), ElementsAre("per frame"));
+  }
+  ScopedLogCapture capture;
+  warn();
+  EXPECT_THAT(capture.messages(), ElementsAre("per frame"));
+}
+
 TEST(RateLimiterTest, FirstEventPassesWhateverTheClock) {
   RateLimiter limiter(5);
   EXPECT_TRUE(limiter.ShouldPass(0));

@@ -1,9 +1,12 @@
 #include "tavik/base/testing/log_capture.h"
 
+#include "tavik/base/logging.h"
+
 namespace tavik::test {
 
 ScopedLogCapture::ScopedLogCapture()
     : previous_minimum_(android::base::SetMinimumLogSeverity(android::base::VERBOSE)) {
+  RateLimiter::ResetAllForTesting();
   android::base::SetLogger([this](android::base::LogId, android::base::LogSeverity severity,
                                   const char* tag, const char* file, unsigned int line,
                                   const char* message) {

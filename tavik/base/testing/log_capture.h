@@ -1,5 +1,7 @@
 // Captures log lines for assertions. While a capture lives, every line of VERBOSE and above goes
-// to it instead of stderr; lines from every thread are kept, in order.
+// to it instead of stderr; lines from every thread are kept, in order. A new capture also restarts
+// every rate-limited call site, so that a test sees the first line of each whatever ran before it
+// in the process.
 #ifndef TAVIK_BASE_TESTING_LOG_CAPTURE_H_
 #define TAVIK_BASE_TESTING_LOG_CAPTURE_H_
 
