@@ -62,6 +62,10 @@ zel_tuning_block_internal::Base<vosbrine::zelmondrake::LscTuning>::GetLscTables(
 // null block is refused.
 class TAVIK_EXPORT ZelTuningBundle : public TuningBundle {
  public:
+  ZelTuningBundle() = default;
+  // Room for `expected_blocks` without growing.
+  explicit ZelTuningBundle(size_t expected_blocks) { blocks_.reserve(expected_blocks); }
+
   const TuningBlock* GetBlock(std::string_view name) const override;
   Status AddBlock(std::shared_ptr<const TuningBlock> block) override;
 

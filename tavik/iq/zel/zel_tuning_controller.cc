@@ -254,7 +254,7 @@ StatusOr<std::shared_ptr<TuningBundle>> ZelTuningController::FillSubBlocksTuning
     requested[position->second] = true;
   }
 
-  auto bundle = std::make_shared<ZelTuningBundle>();
+  auto bundle = std::make_shared<ZelTuningBundle>(block_names.size());
   Status first_failure;
   auto keep_first = [&first_failure](const Status& status) {
     if (!status.ok() && first_failure.ok()) first_failure = status;
