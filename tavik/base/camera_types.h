@@ -20,6 +20,15 @@ struct GenericSize {
   friend bool operator==(const GenericSize&, const GenericSize&) = default;
 };
 
+// A point of a curve, as the service passes the application's tone curves.
+template <typename T>
+struct GenericPoint {
+  T x = 0;
+  T y = 0;
+
+  friend bool operator==(const GenericPoint&, const GenericPoint&) = default;
+};
+
 template <typename T>
 struct Range {
   T min = 0;

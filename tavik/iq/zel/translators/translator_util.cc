@@ -13,6 +13,23 @@ int64_t ToFixedPoint(float value, int fractional_bits, int64_t min, int64_t max)
   return code < min ? min : code > max ? max : code;
 }
 
+int64_t TruncateWrapping(double value) {
+  if (!std::isfinite(value)) return 0;
+  // fmod is exact, so the remainder is the wrapped value itself, of magnitude below 2^64, and
+  // converts to uint64 without loss; a negative one wraps by unsigned negation.
+  constexpr double kTwoToThe64 = 18446744073709551616.0;
+  const double remainder = std::fmod(std::trunc(value), kTwoToThe64);
+  const uint64_t word = remainder < 0 ? uint64_t{0} - static_cast<uint64_t>(-remainder)
+                                      : static_cast<uint64_t>(remainder);
+  return static_cast<int64_t>(word);
+}
+
+uint32_t TruncateToUint32(double value) {
+  if (!(value > 0)) return 0;
+  if (value >= 4294967295.0) return 0xFFFFFFFFu;
+  return static_cast<uint32_t>(value);
+}
+
 uint32_t ClutPacking(uint16_t a, uint16_t b, uint16_t c) {
   const uint32_t high = a;
   const uint32_t middle = b;

@@ -47,6 +47,15 @@ constexpr uint64_t LowBits(int64_t value, int width) {
   return static_cast<uint64_t>(value) & ((width >= 64 ? 0 : (uint64_t{1} << width)) - 1);
 }
 
+// The integer part of `value` (truncated toward zero) as a 64-bit two's-complement word, wrapped
+// modulo 2^64; NaN and infinities give 0. For fields that take the low bits of a value, masked
+// rather than clamped: any float reaches the mask without an out-of-range conversion.
+TAVIK_EXPORT int64_t TruncateWrapping(double value);
+
+// `value` truncated toward zero and limited to [0, 2^32 - 1], NaN giving 0: the saturating
+// float-to-unsigned conversion of the device's CPU, for fields truncated to an unsigned integer.
+TAVIK_EXPORT uint32_t TruncateToUint32(double value);
+
 // One colour-table entry of three components of nominally 10 bits, at most one of them wider:
 // the layout is chosen by which one overflows and announced in the top bits. `a` stands high,
 // `b` in the middle, `c` low.

@@ -1,0 +1,74 @@
+#include "tavik/iq/zel/translators/dg_online_translator.h"
+
+#include <array>
+
+#include "google/protobuf/repeated_field.h"
+#include "tavik/base/status_macros.h"
+#include "tavik/base/trace.h"
+#include "tavik/iq/zel/translators/blc_online_translator.h"
+#include "tavik/iq/zel/translators/translator_util.h"
+#include "tavik/iq/zel/zel_tuning_block.h"
+
+namespace tavik {
+namespace {
+
+namespace zm = ::vosbrine::zelmondrake;
+using ::tavik_registers::zel::g3aa::DgConfigValue;
+
+// Unlike TranslateBlc's, this cap line has a blank after "under".
+constexpr char kCapTextPrefix[] = "Max digital gain * stretch_gain should be under ";
+
+void SetDefaultTuning(zm::BlcTuning& tuning) {
+  tuning.set_enable(true);
+  tuning.mutable_static_param();
+  zm::BlcDynamicParam& dynamic = *tuning.mutable_dynamic_param();
+  for (google::protobuf::RepeatedField<float>* offsets :
+       {dynamic.mutable_offsets_r(), dynamic.mutable_offsets_gr(), dynamic.mutable_offsets_gb(),
+        dynamic.mutable_offsets_b()}) {
+    offsets->Reserve(4);
+    for (int k = 0; k < 4; ++k) offsets->Add(64.0f);
+  }
+}
+
+}  // namespace
+
+Status TranslateDg(const TuningBlock& block, const DgInput& input, DgConfigValue& output) {
+  PerfTrace trace(kTranslatorTraceCategory, "TranslateDg");
+  const zm::BlcTuning* tuning = GetTuningProto<zm::BlcTuning>(block);
+  if (tuning == nullptr) return InvalidArgumentError(kInvalidTuningBlockText);
+  if (!tuning->has_dynamic_param()) {
+    return InvalidArgumentError(blc_internal::kNoDynamicParamText);
+  }
+  // Tested here as well as in CalculateG3AAOffsetGains, so that it comes before the size test.
+  if (input.sensor_bit_depth >= 16) {
+    return InvalidArgumentErrorBuilder()
+           << blc_internal::kDepthTooLargeText << input.sensor_bit_depth;
+  }
+  const zm::BlcDynamicParam& dynamic = tuning->dynamic_param();
+  if (dynamic.offsets_r().empty() || dynamic.offsets_gr().empty() || dynamic.offsets_gb().empty() ||
+      dynamic.offsets_b().empty()) {
+    return InvalidArgumentError("Offsets can't be empty in blc dynamic parameters.");
+  }
+
+  std::array<double, 4> offsets;
+  std::array<double, 4> stretch_gains;
+  TAVIK_RETURN_IF_ERROR(
+      CalculateG3AAOffsetGains(*tuning, input.sensor_bit_depth, offsets, stretch_gains));
+  // Also refuses a NaN gain.
+  if (!(input.digital_gain >= 1.0f)) {
+    return InvalidArgumentError(blc_internal::kDigitalGainBelowOneText);
+  }
+  blc_internal::WriteG3aaGains(stretch_gains, input.digital_gain, input.bayer_pattern,
+                               kCapTextPrefix, output);
+  return OkStatus();
+}
+
+Status GetDefaultDg(DgConfigValue& output) {
+  PerfTrace trace(kTranslatorTraceCategory, "GetDefaultDg");
+  ZelTuningBlock<zm::BlcTuning> block;
+  SetDefaultTuning(block.message);
+  constexpr DgInput kDefaultInput = {vosbrine::RGGB, 10, 1.0f};
+  return TranslateDg(block, kDefaultInput, output);
+}
+
+}  // namespace tavik
