@@ -8,6 +8,8 @@
 #include "tavik/iq/tuning_provider_base.h"
 #include "tavik/iq/zel/sensor_eeprom_data.h"
 #include "tavik/iq/zel/tuning_provider.h"
+#include "tavik/iq/zel/zel_block_list.h"
+#include "tavik/iq/zel/zel_tuning_block.h"
 #include "tools/common/module_calibration_file.h"
 #include "tools/tavik-tune/proto_files.h"
 
@@ -49,7 +51,11 @@ const char kEvalHelp[] =
     "                 all blocks when none is given\n"
     "  --calibration FILE   a device's module calibration (tavik.tools.ModuleCalibrationSet\n"
     "                 in protobuf text), applied to the shading tuning as on the device\n"
-    "  --device NAME  the device, which names the calibration's sensors (default: none)\n";
+    "  --device NAME  the device, which names the calibration's sensors (default: none)\n"
+    "  --translate    also run the block's translators and print their hardware values:\n"
+    "                 each field, tables in full, and the raw words of the record in hex\n"
+    "  --bayer-pattern P, --sensor-type T, --bit-depth N, --digital-gain G\n"
+    "                 the frame facts of the translators (RGGB, SENSOR_TYPE_BAYER, 10, 1.0)\n";
 
 StatusOr<EvalRequest> ParseEvalArgs(const std::vector<std::string>& args) {
   EvalRequest request;
@@ -58,6 +64,10 @@ StatusOr<EvalRequest> ParseEvalArgs(const std::vector<std::string>& args) {
     const std::string& arg = args[i];
     if (arg.rfind("--", 0) != 0) {
       request.paths.push_back(arg);
+      continue;
+    }
+    if (arg == "--translate") {
+      request.translate = true;
       continue;
     }
     if (i + 1 >= args.size()) return InvalidArgumentError(StrCat(arg, " needs a value"));
@@ -84,6 +94,29 @@ StatusOr<EvalRequest> ParseEvalArgs(const std::vector<std::string>& args) {
       }
       usecase.set_camera_usecase(camera_usecase);
       has_usecase = true;
+    } else if (flag == "bayer-pattern") {
+      if (Status s = ParseEnum(vosbrine::BayerPattern_descriptor(), value,
+                               &request.frame_facts.bayer_pattern);
+          !s.ok()) {
+        return s;
+      }
+    } else if (flag == "sensor-type") {
+      if (Status s = ParseEnum(vosbrine::SensorType_descriptor(), value,
+                               &request.frame_facts.sensor_type);
+          !s.ok()) {
+        return s;
+      }
+    } else if (flag == "bit-depth" || flag == "digital-gain") {
+      char* end = nullptr;
+      const float number = std::strtof(value.c_str(), &end);
+      if (value.empty() || *end != '\0') {
+        return InvalidArgumentError(StrCat(arg, " takes a number, not '", value, "'"));
+      }
+      if (flag == "bit-depth") {
+        request.frame_facts.sensor_bit_depth = static_cast<int32_t>(number);
+      } else {
+        request.frame_facts.digital_gain = number;
+      }
     } else if (flag == "calibration") {
       request.calibration_path = value;
     } else if (flag == "device") {
@@ -146,15 +179,32 @@ Status RunEval(const EvalRequest& request, std::ostream& out) {
   out << "# camera state: " << request.state.level_coordinates().ShortDebugString() << "\n";
 
   Status first_failure;
-  for (const BlockType* block : request.blocks) {
-    std::unique_ptr<google::protobuf::Message> message(
-        google::protobuf::MessageFactory::generated_factory()->GetPrototype(block->message)->New());
-    const Status status = (*provider)->FillSubBlockTuning(
-        request.usecase, request.state, message.get(), /*fallback=*/true, /*bypassed=*/false);
-    out << "# " << block->message->name();
-    if (!status.ok()) out << " (failed: " << status.message() << ")";
-    out << "\n" << ToText(*message);
+  auto keep_first = [&first_failure](const Status& status) {
     if (!status.ok() && first_failure.ok()) first_failure = status;
+  };
+  for (const BlockType* block : request.blocks) {
+    // The block as the controller makes it: a typed block holding the filled message.
+    ForEachZelBlockType([&]<size_t Position, typename T>() {
+      if (T::descriptor() != block->message) return;
+      ZelTuningBlock<T> typed_block;
+      const Status status = (*provider)->FillSubBlockTuning(
+          request.usecase, request.state, &typed_block.message, /*fallback=*/true,
+          /*bypassed=*/false);
+      out << "# " << block->message->name();
+      if (!status.ok()) out << " (failed: " << status.message() << ")";
+      out << "\n" << ToText(typed_block.message);
+      keep_first(status);
+      if (!request.translate || !status.ok()) return;
+      for (const tools::TranslatorEntry& translator : tools::Translators()) {
+        if (translator.block_name != block->message->name()) continue;
+        tools::HardwareValues values;
+        const Status translated = translator.run(typed_block, request.frame_facts, values);
+        out << "## " << translator.name;
+        if (!translated.ok()) out << " (failed: " << translated.message() << ")";
+        out << "\n" << values.ToText();
+        keep_first(translated);
+      }
+    });
   }
   return first_failure;
 }

@@ -10,6 +10,7 @@
 #include "tavik/base/status.h"
 #include "tavik/iq/protos/camera_state.pb.h"
 #include "tavik/iq/protos/tuning_usecase.pb.h"
+#include "tools/common/translator_registry.h"
 #include "tools/tavik-tune/tuning_files.h"
 
 namespace tavik::tune {
@@ -23,12 +24,16 @@ struct EvalRequest {
   // shading tuning at load as on the device; none when empty.
   std::string calibration_path;
   std::string device_name;  // Names the sensors of the calibration: "fennelmoore" or other.
+  // Also run every translator of each block, on these frame facts, and print the values.
+  bool translate = false;
+  tools::FrameFacts frame_facts;
 };
 
 // Parses "DIR --sensor S --mode M --usecase U [--cct X ...] [--block NAME ...]". Coordinates are
 // named after the camera state's fields, with dashes: --cct, --gain (real_gain), --led
 // (led_influence), --bv, --exp-ratio, --mired-cct, --scaler-ratio, --pre-scaler-ratio,
-// --frame-count, --exposure-time-msecs; --calibration FILE and --device NAME.
+// --frame-count, --exposure-time-msecs; --calibration FILE and --device NAME; --translate with
+// --bayer-pattern, --sensor-type, --bit-depth and --digital-gain.
 StatusOr<EvalRequest> ParseEvalArgs(const std::vector<std::string>& args);
 
 // Loads the forest and prints the key used, then each block in text form.
