@@ -5,6 +5,7 @@
 #include <cfloat>
 #include <cmath>
 
+#include "absl/container/inlined_vector.h"
 #include "tavik/base/strings.h"
 
 namespace tavik {
@@ -73,9 +74,11 @@ Status CalibrateGridGain(const RepeatedField<float>& device, const RepeatedField
 
 // Grid positions of the output nodes along one axis, as an input node index and the fraction
 // towards the next node. The position is accumulated by repeated addition.
+// On the stack for any grid up to the production size, so that the per-frame crop allocates
+// nothing.
 struct AxisSamples {
-  std::vector<int> index;
-  std::vector<float> fraction;
+  absl::InlinedVector<int, 64> index;
+  absl::InlinedVector<float, 64> fraction;
 };
 
 AxisSamples SampleAxis(float margin, float frame, float cropped, int in_nodes, int out_nodes) {
@@ -154,7 +157,8 @@ Status FactorizeLsc(const vosbrine::LscTables& full, vosbrine::LscTables& high_f
 
   // The gain common to the four channels at each node.
   const ConstPlanes planes = GetPlanes(full);
-  std::vector<float> m(static_cast<size_t>(width) * height);
+  // The work plane, on the stack for grids up to the production 33 by 25.
+  absl::InlinedVector<float, 1024> m(static_cast<size_t>(width) * height);
   for (size_t i = 0; i < m.size(); ++i) {
     m[i] = std::min(std::min((*planes[0])[i], (*planes[1])[i]),
                     std::min((*planes[2])[i], (*planes[3])[i]));
