@@ -1,0 +1,81 @@
+#include "tavik/iq/zel/translators/translator_util.h"
+
+#include <cmath>
+#include <limits>
+
+#include "gtest/gtest.h"
+#include "tavik/base/testing/status_matchers.h"
+#include "tavik/iq/zel/protos/blc_param.pb.h"
+
+namespace tavik {
+namespace {
+
+using ::tavik::test::IsOk;
+using ::tavik::test::StatusIs;
+
+TEST(ClutPackingTest, WorkedExamples) {
+  EXPECT_EQ(ClutPacking(1024, 1, 2), 0xA0000802u);
+  EXPECT_EQ(ClutPacking(1, 2, 3), 0x00100803u);
+}
+
+TEST(ClutPackingTest, EachOverflowingComponentHasItsLayout) {
+  // a overflows: prefix 0xA, a's low 7 bits at 22, b at 11, c low.
+  EXPECT_EQ(ClutPacking(1023 + 5, 7, 9), 0xA0000000u | (4u << 22) | (7u << 11) | 9u);
+  // All within 10 bits: a at 20, b at 10, c low.
+  EXPECT_EQ(ClutPacking(1023, 1023, 1023), (1023u << 20) | (1023u << 10) | 1023u);
+  // c overflows: prefix 0xE, c's low 7 bits at 22, a at 11, b low.
+  EXPECT_EQ(ClutPacking(3, 5, 1024 + 0x45), 0xE0000000u | (0x45u << 22) | (3u << 11) | 5u);
+  // b overflows: prefix 0xC, b's low 8 bits (not 7) at 22, a at 11, c low.
+  EXPECT_EQ(ClutPacking(3, 1024 + 0xC5, 5), 0xC0000000u | (0xC5u << 22) | (3u << 11) | 5u);
+}
+
+TEST(ClutPackingTest, OverflowOfAIsTestedFirst) {
+  // Both a and b overflow: a's layout wins, and b reaches the bits above its place unmasked.
+  EXPECT_EQ(ClutPacking(1024, 1024, 0), 0xA0000000u | (1024u << 11));
+}
+
+TEST(ToFixedPointTest, RoundsHalfAwayFromZeroThenLimits) {
+  EXPECT_EQ(ToFixedPoint(0.5f, 0, -100, 100), 1);
+  EXPECT_EQ(ToFixedPoint(-0.5f, 0, -100, 100), -1);
+  EXPECT_EQ(ToFixedPoint(2.5f, 0, -100, 100), 3);
+  EXPECT_EQ(ToFixedPoint(0.25f, 2, -100, 100), 1);
+  EXPECT_EQ(ToFixedPoint(1.0f, 14, 0, 16384), 16384);
+  EXPECT_EQ(ToFixedPoint(2.0f, 14, 0, 16384), 16384);
+  EXPECT_EQ(ToFixedPoint(-1.0f, 14, 0, 16384), 0);
+}
+
+TEST(ToFixedPointTest, MultipliesInSinglePrecision) {
+  // 0.1f * 1024 = 102.4000015... rounds to 102.
+  EXPECT_EQ(ToFixedPoint(0.1f, 10, 0, 4095), 102);
+}
+
+TEST(ToFixedPointTest, ExtremesNeverOverflowTheConversion) {
+  EXPECT_EQ(ToFixedPoint(std::numeric_limits<float>::infinity(), 30, 0, 255), 255);
+  EXPECT_EQ(ToFixedPoint(-std::numeric_limits<float>::infinity(), 30, 0, 255), 0);
+  EXPECT_EQ(ToFixedPoint(std::nanf(""), 4, -8, 7), -8);
+  EXPECT_EQ(ToFixedPoint(3e38f, 20, 0, 1), 1);
+}
+
+TEST(LowBitsTest, MasksTwosComplement) {
+  EXPECT_EQ(LowBits(-1024, 15), 31744u);
+  EXPECT_EQ(LowBits(0x12345, 16), 0x2345u);
+  EXPECT_EQ(LowBits(-1, 64), ~uint64_t{0});
+}
+
+TEST(CheckTuningTest, StockTextsInOrder) {
+  EXPECT_THAT(CheckTuning<vosbrine::zelmondrake::BlcTuning>(nullptr),
+              StatusIs(StatusCode::kInvalidArgument, "Invalid TuningBlock!"));
+  vosbrine::zelmondrake::BlcTuning tuning;
+  tuning.mutable_static_param();
+  EXPECT_THAT(CheckTuning(&tuning),
+              StatusIs(StatusCode::kInvalidArgument, "Tuning data doesn't have region info."));
+  tuning.clear_static_param();
+  tuning.mutable_dynamic_param();
+  EXPECT_THAT(CheckTuning(&tuning),
+              StatusIs(StatusCode::kInvalidArgument, "Tuning data doesn't have static info."));
+  tuning.mutable_static_param();
+  EXPECT_THAT(CheckTuning(&tuning), IsOk());
+}
+
+}  // namespace
+}  // namespace tavik
