@@ -69,18 +69,6 @@ float DepthScale(int32_t full_bits, int32_t sensor_bit_depth) {
   return static_cast<float>(uint32_t{1} << count);
 }
 
-void SetDefaultTuning(zm::BlcTuning& tuning) {
-  tuning.set_enable(true);
-  tuning.mutable_static_param();
-  zm::BlcDynamicParam& dynamic = *tuning.mutable_dynamic_param();
-  for (google::protobuf::RepeatedField<float>* offsets :
-       {dynamic.mutable_offsets_r(), dynamic.mutable_offsets_gr(), dynamic.mutable_offsets_gb(),
-        dynamic.mutable_offsets_b()}) {
-    offsets->Reserve(4);
-    for (int k = 0; k < 4; ++k) offsets->Add(64.0f);
-  }
-}
-
 constexpr BlcInput kDefaultInput = {vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 1.0f};
 
 }  // namespace
@@ -231,7 +219,7 @@ Status TranslateBlc(const TuningBlock& block, const BlcInput& input, DgConfigVal
 Status GetDefaultBlc(BlcIppOutput& output, BlcIppFixedOutput& fixed) {
   PerfTrace trace(kTranslatorTraceCategory, "GetDefaultBlc");
   ZelTuningBlock<zm::BlcTuning> block;
-  SetDefaultTuning(block.message);
+  blc_internal::SetDefaultTuning(block.message);
   TAVIK_RETURN_IF_ERROR(TranslateBlc(block, kDefaultInput, output));
   // Constants of the configuration, written by word.
   fixed = BlcIppFixedOutput{};
@@ -243,14 +231,14 @@ Status GetDefaultBlc(BlcIppOutput& output, BlcIppFixedOutput& fixed) {
 Status GetDefaultBlc(BlcConfigValue* output) {
   PerfTrace trace(kTranslatorTraceCategory, "GetDefaultBlc");
   ZelTuningBlock<zm::BlcTuning> block;
-  SetDefaultTuning(block.message);
+  blc_internal::SetDefaultTuning(block.message);
   return TranslateBlc(block, kDefaultInput, output);
 }
 
 Status GetDefaultBlc(DgConfigValue* output) {
   PerfTrace trace(kTranslatorTraceCategory, "GetDefaultBlc");
   ZelTuningBlock<zm::BlcTuning> block;
-  SetDefaultTuning(block.message);
+  blc_internal::SetDefaultTuning(block.message);
   return TranslateBlc(block, kDefaultInput, output);
 }
 
@@ -295,6 +283,18 @@ void WriteG3aaGains(const std::array<double, 4>& stretch_gains, float digital_ga
   output.gain_b = values[kB];
   output.enable = 1;
   output.pixel_order = GetG3aaPixelOrder(bayer_pattern);
+}
+
+void SetDefaultTuning(zm::BlcTuning& tuning) {
+  tuning.set_enable(true);
+  tuning.mutable_static_param();
+  zm::BlcDynamicParam& dynamic = *tuning.mutable_dynamic_param();
+  for (google::protobuf::RepeatedField<float>* offsets :
+       {dynamic.mutable_offsets_r(), dynamic.mutable_offsets_gr(), dynamic.mutable_offsets_gb(),
+        dynamic.mutable_offsets_b()}) {
+    offsets->Reserve(4);
+    for (int k = 0; k < 4; ++k) offsets->Add(64.0f);
+  }
 }
 
 }  // namespace blc_internal

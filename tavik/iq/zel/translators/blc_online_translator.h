@@ -118,6 +118,10 @@ void WriteG3aaGains(const std::array<double, 4>& stretch_gains, float digital_ga
                     vosbrine::BayerPattern bayer_pattern, const char* cap_text_prefix,
                     tavik_registers::zel::g3aa::DgConfigValue& output);
 
+// The default tuning of the block, shared by the defaults of both units: enabled, an empty static
+// part, and offsets of 64.0 in each of the four lists of four.
+void SetDefaultTuning(vosbrine::zelmondrake::BlcTuning& tuning);
+
 }  // namespace blc_internal
 }  // namespace tavik
 

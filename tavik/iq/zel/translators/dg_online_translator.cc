@@ -18,18 +18,6 @@ using ::tavik_registers::zel::g3aa::DgConfigValue;
 // Unlike TranslateBlc's, this cap line has a blank after "under".
 constexpr char kCapTextPrefix[] = "Max digital gain * stretch_gain should be under ";
 
-void SetDefaultTuning(zm::BlcTuning& tuning) {
-  tuning.set_enable(true);
-  tuning.mutable_static_param();
-  zm::BlcDynamicParam& dynamic = *tuning.mutable_dynamic_param();
-  for (google::protobuf::RepeatedField<float>* offsets :
-       {dynamic.mutable_offsets_r(), dynamic.mutable_offsets_gr(), dynamic.mutable_offsets_gb(),
-        dynamic.mutable_offsets_b()}) {
-    offsets->Reserve(4);
-    for (int k = 0; k < 4; ++k) offsets->Add(64.0f);
-  }
-}
-
 }  // namespace
 
 Status TranslateDg(const TuningBlock& block, const DgInput& input, DgConfigValue& output) {
@@ -66,7 +54,7 @@ Status TranslateDg(const TuningBlock& block, const DgInput& input, DgConfigValue
 Status GetDefaultDg(DgConfigValue& output) {
   PerfTrace trace(kTranslatorTraceCategory, "GetDefaultDg");
   ZelTuningBlock<zm::BlcTuning> block;
-  SetDefaultTuning(block.message);
+  blc_internal::SetDefaultTuning(block.message);
   constexpr DgInput kDefaultInput = {vosbrine::RGGB, 10, 1.0f};
   return TranslateDg(block, kDefaultInput, output);
 }
