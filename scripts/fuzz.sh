@@ -1,8 +1,8 @@
 #!/usr/bin/env bash
 # Runs one libFuzzer target for a while:  scripts/fuzz.sh NAME SECONDS [libFuzzer flags...]
 # Builds the fuzz tree with clang 14 (ASan + UBSan) in build-fuzz/ when needed. Seeds come from
-# fuzz/corpus/NAME; what the run finds new goes to build-fuzz/corpus/NAME, crashes to
-# build-fuzz/artifacts/.
+# fuzz/corpus/NAME and, for the targets that read tuning files, from the sample tuning set; what
+# the run finds new goes to build-fuzz/corpus/NAME, crashes to build-fuzz/artifacts/.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -21,11 +21,14 @@ if [ ! -f "$build/build.ninja" ]; then
   CXX=clang++-14 CC=clang-14 cmake -S . -B "$build" -G Ninja -DCMAKE_BUILD_TYPE=RelWithDebInfo \
     -DTAVIK_BUILD_FUZZERS=ON -DTAVIK_BUILD_TESTS=OFF -DTAVIK_BUILD_BENCHMARKS=OFF
 fi
-cmake --build "$build" --target "$name"
+cmake --build "$build" --target "$name" tavik_sample_tuning
 
 corpus="$build/corpus/$name"
 mkdir -p "$corpus" "$build/artifacts"
 seeds=()
-if [ -d "fuzz/corpus/$name" ]; then seeds=("fuzz/corpus/$name"); fi
+if [ -d "fuzz/corpus/$name" ]; then seeds+=("fuzz/corpus/$name"); fi
+case "$name" in
+  provider_load_fuzzer|tuning_usecase_data_fuzzer) seeds+=("$build/share/tavik/tuning") ;;
+esac
 "$build/fuzz/$name" "$corpus" "${seeds[@]}" -max_total_time="$seconds" \
   -artifact_prefix="$build/artifacts/" -print_final_stats=1 "$@"
