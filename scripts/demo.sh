@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # The main job on the sample tuning set: builds what is needed, then shows what the tuning tool
 # sees in it: the forest's keys, a lint pass, and a few blocks evaluated for a rear-camera frame
-# at a colour temperature between two tuned regions.
+# at a colour temperature between two tuned regions, translated to hardware values.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -19,9 +19,11 @@ echo
 echo "== Lint"
 "$tune" lint "$tuning" && echo "no findings"
 echo
-echo "== Rear camera viewfinder at 4200 K, gain 6: white balance and black level"
+echo "== Rear camera viewfinder at 4750 K, gain 6: white balance, and black level with the"
+echo "   hardware values of its translators at digital gain 2"
 "$tune" eval "$tuning" --sensor BRIMAL_REAR_GN1_NORMAL --mode FULL_4_3_FULL_15_30FPS \
-  --usecase VIEWFINDER --cct 4200 --gain 6 --block WbTuning --block BlcTuning
+  --usecase VIEWFINDER --cct 4750 --gain 6 --block WbTuning --block BlcTuning \
+  --translate --digital-gain 2
 echo
 echo "== A use case with no file of its own falls back to the nearest key"
 "$tune" eval "$tuning" --sensor BRIMAL_REAR_GN1_NORMAL --mode FULL_4_3_FULL_15_30FPS \
