@@ -45,8 +45,8 @@ struct SensorModuleSpec {
 
   friend bool operator==(const SensorModuleSpec&, const SensorModuleSpec&) = default;
   template <typename H>
-  friend H AbslHashValue(H state, const SensorModuleSpec& spec) {
-    return H::combine(std::move(state), spec.facing, spec.lens_type, spec.sensor_kind);
+  friend H AbslHashValue(H state, const SensorModuleSpec& module) {
+    return H::combine(std::move(state), module.facing, module.lens_type, module.sensor_kind);
   }
 };
 

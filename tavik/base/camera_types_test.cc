@@ -129,26 +129,26 @@ TEST(RangeTest, DefaultsToZeroAndComparesBothEnds) {
 }
 
 TEST(SensorModuleSpecTest, DefaultsToARearNormalVisibleModule) {
-  const tavik_api::SensorModuleSpec spec;
-  EXPECT_EQ(spec.facing, 0);
-  EXPECT_EQ(spec.lens_type, 0);
-  EXPECT_EQ(spec.sensor_kind, 0);
+  const tavik_api::SensorModuleSpec module;
+  EXPECT_EQ(module.facing, 0);
+  EXPECT_EQ(module.lens_type, 0);
+  EXPECT_EQ(module.sensor_kind, 0);
 }
 
 TEST(SensorModuleSpecTest, IsThreeInt32Words) {
   EXPECT_EQ(sizeof(tavik_api::SensorModuleSpec), 3 * sizeof(int32_t));
-  const tavik_api::SensorModuleSpec spec{1, 2, 1};
-  EXPECT_EQ(spec.facing, 1);
-  EXPECT_EQ(spec.lens_type, 2);
-  EXPECT_EQ(spec.sensor_kind, 1);
+  const tavik_api::SensorModuleSpec module{1, 2, 1};
+  EXPECT_EQ(module.facing, 1);
+  EXPECT_EQ(module.lens_type, 2);
+  EXPECT_EQ(module.sensor_kind, 1);
 }
 
 TEST(SensorModuleSpecTest, EqualityComparesEveryWord) {
-  const tavik_api::SensorModuleSpec spec{1, 2, 0};
-  EXPECT_EQ(spec, (tavik_api::SensorModuleSpec{1, 2, 0}));
-  EXPECT_FALSE(spec == (tavik_api::SensorModuleSpec{0, 2, 0}));
-  EXPECT_FALSE(spec == (tavik_api::SensorModuleSpec{1, 0, 0}));
-  EXPECT_FALSE(spec == (tavik_api::SensorModuleSpec{1, 2, 1}));
+  const tavik_api::SensorModuleSpec module{1, 2, 0};
+  EXPECT_EQ(module, (tavik_api::SensorModuleSpec{1, 2, 0}));
+  EXPECT_FALSE(module == (tavik_api::SensorModuleSpec{0, 2, 0}));
+  EXPECT_FALSE(module == (tavik_api::SensorModuleSpec{1, 0, 0}));
+  EXPECT_FALSE(module == (tavik_api::SensorModuleSpec{1, 2, 1}));
 }
 
 TEST(LensShadingCalibrationDataTest, DefaultsToAnEmptyGrid) {

@@ -50,20 +50,20 @@ inline void ExpectFields(const google::protobuf::Descriptor* message,
   SCOPED_TRACE(message->full_name());
   ASSERT_EQ(message->field_count(), static_cast<int>(fields.size()));
   int index = 0;
-  for (const FieldSpec& spec : fields) {
+  for (const FieldSpec& expected : fields) {
     const google::protobuf::FieldDescriptor* field = message->field(index++);
-    SCOPED_TRACE(spec.name);
-    EXPECT_EQ(field->name(), spec.name);
-    EXPECT_EQ(field->number(), spec.number);
-    EXPECT_EQ(field->type(), spec.type);
-    EXPECT_EQ(field->label(), spec.label);
-    EXPECT_EQ(field->options().deprecated(), spec.deprecated);
+    SCOPED_TRACE(expected.name);
+    EXPECT_EQ(field->name(), expected.name);
+    EXPECT_EQ(field->number(), expected.number);
+    EXPECT_EQ(field->type(), expected.type);
+    EXPECT_EQ(field->label(), expected.label);
+    EXPECT_EQ(field->options().deprecated(), expected.deprecated);
     if (field->message_type() != nullptr) {
-      EXPECT_EQ(field->message_type()->full_name(), spec.type_name);
+      EXPECT_EQ(field->message_type()->full_name(), expected.type_name);
     } else if (field->enum_type() != nullptr) {
-      EXPECT_EQ(field->enum_type()->full_name(), spec.type_name);
+      EXPECT_EQ(field->enum_type()->full_name(), expected.type_name);
     } else {
-      EXPECT_EQ(spec.type_name, "");
+      EXPECT_EQ(expected.type_name, "");
     }
   }
 }

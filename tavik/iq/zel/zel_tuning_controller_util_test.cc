@@ -36,11 +36,11 @@ constexpr int kVideoLiveShot = 4;
 constexpr int kViewfinderAlternate = 5;
 
 tavik_api::SensorModuleSpec Module(int facing, int lens_type, int sensor_kind) {
-  tavik_api::SensorModuleSpec spec;
-  spec.facing = facing;
-  spec.lens_type = lens_type;
-  spec.sensor_kind = sensor_kind;
-  return spec;
+  tavik_api::SensorModuleSpec module;
+  module.facing = facing;
+  module.lens_type = lens_type;
+  module.sensor_kind = sensor_kind;
+  return module;
 }
 
 UseCase MakeUseCase(int type, bool torch = false, bool first_party = true, bool night = false) {
