@@ -1,14 +1,19 @@
 #!/usr/bin/env bash
-# The main job on the sample tuning set: builds what is needed, then shows what the tuning tool
-# sees in it: the forest's keys, a lint pass, and a few blocks evaluated for a rear-camera frame
-# at a colour temperature between two tuned regions, translated to hardware values.
+# The main job on the sample tuning set: builds what is needed, runs a simulated camera session
+# of the built-in scenario through the tuning controller and prints its summary; then shows what
+# the tuning tool sees in the set: the forest's keys, a lint pass, and a few blocks evaluated for
+# a rear-camera frame between two tuned regions, translated to hardware values.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
 scripts/install-deps.sh > /dev/null
 build=build
 cmake -S . -B "$build" -G Ninja -DCMAKE_BUILD_TYPE=RelWithDebInfo > /dev/null
-cmake --build "$build" --target tavik-tune tavik_sample_tuning > /dev/null
+cmake --build "$build" --target tavik-sim tavik-tune tavik_sample_tuning > /dev/null
+
+echo "== A simulated camera session: the built-in scenario through the controller"
+"$build/tools/tavik-sim"
+echo
 
 tune="$build/tools/tavik-tune"
 tuning="$build/share/tavik/tuning"
