@@ -1,10 +1,6 @@
-// Runs a piece of a test in a fresh process of the test binary.
-//
-// Warnings that could fire every frame are logged at most once per 5 s per call site and process,
-// so a test that asserts such a warning must be the first user of its call site in its process.
-// Whatever ran before in this process (other tests of the binary, when they all run in one
-// process), the body given here runs where no call site has been used yet: a death-test child in
-// the "threadsafe" style re-executes the binary and runs only the current test up to this point.
+// Runs a piece of a test in a fresh process of the test binary, for a body that changes the
+// process for good (gives up a right, say): a death-test child in the "threadsafe" style
+// re-executes the binary and runs only the current test up to this point.
 #ifndef TAVIK_IQ_TESTING_FRESH_PROCESS_H_
 #define TAVIK_IQ_TESTING_FRESH_PROCESS_H_
 

@@ -435,46 +435,37 @@ TEST(ZelTuningControllerUseCaseTest, OneUnmappablePartDiscardsTheOthers) {
   EXPECT_EQ(GeneratedKey(*controller, *unknown_type), kDefaultKey);
 }
 
-// The three warnings below are rate-limited per call site and process: each is asserted only
-// here, in a fresh process where its call site is used for the first time.
+// The three warnings below are rate-limited per call site; a new log capture restarts the sites,
+// so each test sees its site's first line.
 
 TEST(ZelTuningControllerUseCaseTest, UnmappableSensorWarnsAndGivesTheDefault) {
-  ExpectInFreshProcess([]() -> std::string {
-    std::unique_ptr<ZelTuningController> controller = ControllerWithoutTuning();
-    TuningInfo info = Gn1Info();
-    info.sensor_mode_info.sensor_name = "NOSUCHSENSOR";
-    std::shared_ptr<ZelTuningPoint> point = MakePoint(*controller, Viewfinder(), info, AtGain(2));
-    ScopedLogCapture log;
-    const std::string key = GeneratedKey(*controller, *point);
-    if (key != kDefaultKey) return "key: " + key;
-    return CheckLogCount(log, "INVALID_CAMERA_SENSOR. Using default", 1);
-  });
+  std::unique_ptr<ZelTuningController> controller = ControllerWithoutTuning();
+  TuningInfo info = Gn1Info();
+  info.sensor_mode_info.sensor_name = "NOSUCHSENSOR";
+  std::shared_ptr<ZelTuningPoint> point = MakePoint(*controller, Viewfinder(), info, AtGain(2));
+  ScopedLogCapture log;
+  EXPECT_EQ(GeneratedKey(*controller, *point), kDefaultKey);
+  EXPECT_EQ(log.Count("INVALID_CAMERA_SENSOR. Using default"), 1);
 }
 
 TEST(ZelTuningControllerUseCaseTest, UnmappableSensorModeWarnsAndGivesTheDefault) {
-  ExpectInFreshProcess([]() -> std::string {
-    std::unique_ptr<ZelTuningController> controller = ControllerWithoutTuning();
-    TuningInfo info = Gn1Info();
-    info.sensor_mode_info.binning_x = 3;
-    info.sensor_mode_info.binning_y = 3;
-    std::shared_ptr<ZelTuningPoint> point = MakePoint(*controller, Viewfinder(), info, AtGain(2));
-    ScopedLogCapture log;
-    const std::string key = GeneratedKey(*controller, *point);
-    if (key != kDefaultKey) return "key: " + key;
-    return CheckLogCount(log, "INVALID_SENSOR_MODE. Using default", 1);
-  });
+  std::unique_ptr<ZelTuningController> controller = ControllerWithoutTuning();
+  TuningInfo info = Gn1Info();
+  info.sensor_mode_info.binning_x = 3;
+  info.sensor_mode_info.binning_y = 3;
+  std::shared_ptr<ZelTuningPoint> point = MakePoint(*controller, Viewfinder(), info, AtGain(2));
+  ScopedLogCapture log;
+  EXPECT_EQ(GeneratedKey(*controller, *point), kDefaultKey);
+  EXPECT_EQ(log.Count("INVALID_SENSOR_MODE. Using default"), 1);
 }
 
 TEST(ZelTuningControllerUseCaseTest, UnmappableUseCaseWarnsAndGivesTheDefault) {
-  ExpectInFreshProcess([]() -> std::string {
-    std::unique_ptr<ZelTuningController> controller = ControllerWithoutTuning();
-    std::shared_ptr<ZelTuningPoint> point =
-        MakePoint(*controller, MakeUseCase(6), Gn1Info(), AtGain(2));
-    ScopedLogCapture log;
-    const std::string key = GeneratedKey(*controller, *point);
-    if (key != kDefaultKey) return "key: " + key;
-    return CheckLogCount(log, "INVALID_CAMERA_USECASE. Using default", 1);
-  });
+  std::unique_ptr<ZelTuningController> controller = ControllerWithoutTuning();
+  std::shared_ptr<ZelTuningPoint> point =
+      MakePoint(*controller, MakeUseCase(6), Gn1Info(), AtGain(2));
+  ScopedLogCapture log;
+  EXPECT_EQ(GeneratedKey(*controller, *point), kDefaultKey);
+  EXPECT_EQ(log.Count("INVALID_CAMERA_USECASE. Using default"), 1);
 }
 
 // ---------------------------------------------------------------------------------------------
@@ -633,22 +624,16 @@ TEST(ZelTuningControllerBlockEnabledTest, DefaultUseCaseAnswerIgnoresTheBypassMa
 }
 
 TEST(ZelTuningControllerBlockEnabledTest, UseCaseWithoutFileWarns) {
-  // Rate-limited per call site and process: asserted only here, in a fresh process.
-  ExpectInFreshProcess([]() -> std::string {
-    std::unique_ptr<ZelTuningController> controller = SampleController();
-    UseCase third_party = Viewfinder();
-    third_party.first_party = false;
-    std::shared_ptr<ZelTuningPoint> point =
-        MakePoint(*controller, third_party, Gn1Info(), AtGain(2));
-    ScopedLogCapture log;
-    StatusOr<bool> enabled = controller->IsBlockEnabled(*point, "StkTuning");
-    if (!enabled.ok() || *enabled) return "expected OK and false";
-    return CheckLogCount(log,
-                         "Cannot find tuning use case: BRIMAL_REAR_GN1_NORMAL, "
-                         "FULL_4_3_FULL_15_30FPS, VIEWFINDER_3P. Using default tuning for "
-                         "IsSubBlockEnabled().",
-                         1);
-  });
+  std::unique_ptr<ZelTuningController> controller = SampleController();
+  UseCase third_party = Viewfinder();
+  third_party.first_party = false;
+  std::shared_ptr<ZelTuningPoint> point = MakePoint(*controller, third_party, Gn1Info(), AtGain(2));
+  ScopedLogCapture log;
+  EXPECT_THAT(controller->IsBlockEnabled(*point, "StkTuning"), IsOkAndHolds(false));
+  EXPECT_EQ(log.Count("Cannot find tuning use case: BRIMAL_REAR_GN1_NORMAL, "
+                      "FULL_4_3_FULL_15_30FPS, VIEWFINDER_3P. Using default tuning for "
+                      "IsSubBlockEnabled()."),
+            1);
 }
 
 // ---------------------------------------------------------------------------------------------
@@ -882,18 +867,14 @@ TEST(ZelTuningControllerInterpolateTest, EmptyNameSetGivesAnEmptyBundle) {
 }
 
 TEST(ZelTuningControllerInterpolateTest, EmptyNameSetStillGeneratesTheUseCase) {
-  // The use case is seen at work through its rate-limited warning, which is asserted only here,
-  // in a fresh process where its call site is used for the first time.
-  ExpectInFreshProcess([]() -> std::string {
-    std::unique_ptr<ZelTuningController> controller = SampleController();
-    TuningInfo unnamed = Gn1Info();
-    unnamed.sensor_mode_info.sensor_name = "NOSUCHSENSOR";
-    ScopedLogCapture log;
-    StatusOr<std::shared_ptr<TuningBundle>> bundle =
-        controller->Interpolate(MakePoint(*controller, Viewfinder(), unnamed, AtGain(2)), {});
-    if (!bundle.ok()) return bundle.status().ToString();
-    return CheckLogCount(log, "INVALID_CAMERA_SENSOR. Using default", 1);
-  });
+  // The use case is seen at work through its warning.
+  std::unique_ptr<ZelTuningController> controller = SampleController();
+  TuningInfo unnamed = Gn1Info();
+  unnamed.sensor_mode_info.sensor_name = "NOSUCHSENSOR";
+  ScopedLogCapture log;
+  TAVIK_EXPECT_OK(
+      controller->Interpolate(MakePoint(*controller, Viewfinder(), unnamed, AtGain(2)), {}));
+  EXPECT_EQ(log.Count("INVALID_CAMERA_SENSOR. Using default"), 1);
 }
 
 TEST(ZelTuningControllerInterpolateTest, BundleHoldsTheRequestedBlocksOnly) {
