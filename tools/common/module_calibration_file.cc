@@ -1,46 +1,14 @@
 #include "tools/common/module_calibration_file.h"
 
-#include <fstream>
-#include <sstream>
-
-#include "google/protobuf/io/tokenizer.h"
-#include "google/protobuf/text_format.h"
 #include "tavik/base/strings.h"
 #include "tools/common/module_calibration.pb.h"
+#include "tools/common/text_proto.h"
 
 namespace tavik::tools {
-namespace {
-
-class ErrorCollector : public google::protobuf::io::ErrorCollector {
- public:
-  explicit ErrorCollector(const std::string& path) : path_(path) {}
-  void AddError(int line, google::protobuf::io::ColumnNumber column,
-                const std::string& message) override {
-    if (first_.empty()) first_ = StrCat(path_, ":", line + 1, ":", column + 1, ": ", message);
-  }
-  const std::string& first() const { return first_; }
-
- private:
-  const std::string& path_;
-  std::string first_;
-};
-
-}  // namespace
 
 StatusOr<ModuleCalibrationMap> ReadModuleCalibrationFile(const std::string& path) {
-  std::ifstream in(path);
-  if (!in) return NotFoundError(StrCat(path, ": cannot open"));
-  std::ostringstream text;
-  text << in.rdbuf();
-
   ModuleCalibrationSet set;
-  ErrorCollector errors(path);
-  google::protobuf::TextFormat::Parser parser;
-  parser.RecordErrorsTo(&errors);
-  if (!parser.ParseFromString(text.str(), &set)) {
-    return InvalidArgumentError(errors.first().empty() ? StrCat(path, ": not valid text format")
-                                                       : errors.first());
-  }
+  if (Status status = ParseTextProtoFile(path, set); !status.ok()) return status;
 
   ModuleCalibrationMap map;
   for (const ModuleCalibration& module : set.modules()) {
@@ -60,9 +28,9 @@ StatusOr<ModuleCalibrationMap> ReadModuleCalibrationFile(const std::string& path
     data.crop_left = module.crop_left();
     data.crop_top = module.crop_top();
     if (!map.try_emplace(std::move(key), std::move(data)).second) {
-      return InvalidArgumentError(
-          StrCat(path, ": two modules of sensor ", module.sensor_name(), " facing ",
-                 module.facing(), " lens_type ", module.lens_type()));
+      return InvalidArgumentError(StrCat(path, ": two modules of sensor ", module.sensor_name(),
+                                         " facing ", module.facing(), " lens_type ",
+                                         module.lens_type()));
     }
   }
   return map;

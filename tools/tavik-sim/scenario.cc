@@ -1,11 +1,7 @@
 #include "tools/tavik-sim/scenario.h"
 
-#include <fstream>
-#include <sstream>
-
-#include "google/protobuf/io/tokenizer.h"
-#include "google/protobuf/text_format.h"
 #include "tavik/base/strings.h"
+#include "tools/common/text_proto.h"
 
 namespace tavik::sim {
 
@@ -65,20 +61,6 @@ const char kDefaultScenarioText[] = R"pb(
 )pb";
 
 namespace {
-
-class ErrorCollector : public google::protobuf::io::ErrorCollector {
- public:
-  explicit ErrorCollector(std::string_view source) : source_(source) {}
-  void AddError(int line, google::protobuf::io::ColumnNumber column,
-                const std::string& message) override {
-    if (first_.empty()) first_ = StrCat(source_, ":", line + 1, ":", column + 1, ": ", message);
-  }
-  const std::string& first() const { return first_; }
-
- private:
-  std::string_view source_;
-  std::string first_;
-};
 
 Status CheckScenario(const Scenario& scenario, std::string_view source) {
   if (scenario.segments().empty()) return InvalidArgumentError(StrCat(source, ": no segments"));
@@ -148,23 +130,15 @@ float RampAt(const Ramp& ramp, int i, int count) {
 
 StatusOr<Scenario> ParseScenario(std::string_view text, std::string_view source) {
   Scenario scenario;
-  ErrorCollector errors(source);
-  google::protobuf::TextFormat::Parser parser;
-  parser.RecordErrorsTo(&errors);
-  if (!parser.ParseFromString(std::string(text), &scenario)) {
-    return InvalidArgumentError(errors.first().empty() ? StrCat(source, ": not valid text format")
-                                                       : errors.first());
-  }
+  if (Status status = tools::ParseTextProto(text, source, scenario); !status.ok()) return status;
   if (Status status = CheckScenario(scenario, source); !status.ok()) return status;
   return scenario;
 }
 
 StatusOr<Scenario> ReadScenarioFile(const std::string& path) {
-  std::ifstream in(path);
-  if (!in) return NotFoundError(StrCat(path, ": cannot open"));
-  std::ostringstream text;
-  text << in.rdbuf();
-  return ParseScenario(text.str(), path);
+  StatusOr<std::string> text = tools::ReadFileToString(path);
+  if (!text.ok()) return text.status();
+  return ParseScenario(*text, path);
 }
 
 StatusOr<Scenario> DefaultScenario() { return ParseScenario(kDefaultScenarioText, "<default>"); }

@@ -15,6 +15,7 @@
 #include <vector>
 
 #include "android-base/logging.h"
+#include "tools/common/text_proto.h"
 #include "tools/tavik-tune/eval.h"
 #include "tools/tavik-tune/keys.h"
 #include "tools/tavik-tune/lint.h"
@@ -64,12 +65,12 @@ int RunCompile(const std::vector<std::string>& args) {
     return kExitUsage;
   }
   auto message = NewMessageForPath(input);
-  if (Status status = ParseTextFile(input, *message); !status.ok()) return Fail(status);
+  if (Status status = tools::ParseTextProtoFile(input, *message); !status.ok()) return Fail(status);
   std::string bytes;
   if (!message->SerializeToString(&bytes)) {
     return Fail(InternalError(input + ": cannot serialise"));
   }
-  if (Status status = WriteStringToFile(output, bytes); !status.ok()) return Fail(status);
+  if (Status status = tools::WriteStringToFile(output, bytes); !status.ok()) return Fail(status);
   return kExitOk;
 }
 
@@ -130,8 +131,8 @@ const Verb kVerbs[] = {
      "a tree, missing trees, duplicate use-case keys across files, files that aren't .binarypb.\n"
      "One line per finding: FILE: BLOCK: PATH: PROBLEM. Exit status 1 when anything is found.\n",
      RunLint},
-    {"eval", "eval DIR --sensor S --mode M --usecase U [--cct X ...] [--block NAME ...]",
-     kEvalHelp, RunEvalVerb},
+    {"eval", "eval DIR --sensor S --mode M --usecase U [--cct X ...] [--block NAME ...]", kEvalHelp,
+     RunEvalVerb},
     {"keys", "keys DIR...",
      "Prints the forest's keys in sort order, each with the file that won it, and the files\n"
      "that a key dropped because another file with the same key was read first.\n",

@@ -18,12 +18,7 @@ inline constexpr char kGoldenCalibrationMarker[] = "golden_sensor_factory_calibr
 // A new, empty message of the kind that `path` holds.
 std::unique_ptr<google::protobuf::Message> NewMessageForPath(std::string_view path);
 
-StatusOr<std::string> ReadFileToString(const std::string& path);
-Status WriteStringToFile(const std::string& path, std::string_view contents);
-
-// Parses protobuf text into `message`; failures name the file, line and column.
-Status ParseTextFile(const std::string& path, google::protobuf::Message& message);
-// Parses a binary file into `message`.
+// Parses a binary file into `message`. (Text files: tools/common/text_proto.h.)
 Status ParseBinaryFile(const std::string& path, google::protobuf::Message& message);
 
 // Text form of `message`, with Any fields expanded to the message they pack.

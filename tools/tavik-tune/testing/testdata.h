@@ -9,6 +9,7 @@
 #include "gtest/gtest.h"
 #include "tavik/base/file_path.h"
 #include "tavik/base/testing/temp_dir.h"
+#include "tools/common/text_proto.h"
 #include "tools/tavik-tune/proto_files.h"
 
 namespace tavik::tune::test {
@@ -23,7 +24,7 @@ inline std::string CompileTestdata(const tavik::test::TempDir& directory, const 
   if (file_name.empty()) file_name = name.substr(name.rfind('/') + 1);
   const std::string source = TestdataPath(name + ".textproto");
   std::unique_ptr<google::protobuf::Message> message = NewMessageForPath(source);
-  const Status status = ParseTextFile(source, *message);
+  const Status status = tools::ParseTextProtoFile(source, *message);
   EXPECT_TRUE(status.ok()) << status;
   return directory.WriteFile(file_name + ".binarypb", message->SerializeAsString());
 }

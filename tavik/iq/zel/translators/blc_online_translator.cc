@@ -203,17 +203,8 @@ Status TranslateBlc(const TuningBlock& block, const BlcInput& input, DgConfigVal
     return InvalidArgumentError(blc_internal::kNoDynamicParamText);
   }
 
-  std::array<double, 4> offsets;
-  std::array<double, 4> stretch_gains;
-  TAVIK_RETURN_IF_ERROR(
-      CalculateG3AAOffsetGains(*tuning, input.sensor_bit_depth, offsets, stretch_gains));
-  // Also refuses a NaN gain.
-  if (!(input.digital_gain >= 1.0f)) {
-    return InvalidArgumentError(blc_internal::kDigitalGainBelowOneText);
-  }
-  blc_internal::WriteG3aaGains(stretch_gains, input.digital_gain, input.bayer_pattern,
-                               kCapTextPrefix, *output);
-  return OkStatus();
+  return blc_internal::TranslateG3aaGains(*tuning, input.sensor_bit_depth, input.digital_gain,
+                                          input.bayer_pattern, kCapTextPrefix, *output);
 }
 
 Status GetDefaultBlc(BlcIppOutput& output, BlcIppFixedOutput& fixed) {
@@ -258,9 +249,14 @@ std::array<float, 4> GetDynamicBlc(const TuningBlock& block, vosbrine::BayerPatt
 
 namespace blc_internal {
 
-void WriteG3aaGains(const std::array<double, 4>& stretch_gains, float digital_gain,
-                    vosbrine::BayerPattern bayer_pattern, const char* cap_text_prefix,
-                    DgConfigValue& output) {
+Status TranslateG3aaGains(const zm::BlcTuning& tuning, int32_t sensor_bit_depth, float digital_gain,
+                          vosbrine::BayerPattern bayer_pattern, const char* cap_text_prefix,
+                          DgConfigValue& output) {
+  std::array<double, 4> offsets;
+  std::array<double, 4> stretch_gains;
+  TAVIK_RETURN_IF_ERROR(CalculateG3AAOffsetGains(tuning, sensor_bit_depth, offsets, stretch_gains));
+  // Also refuses a NaN gain.
+  if (!(digital_gain >= 1.0f)) return InvalidArgumentError(kDigitalGainBelowOneText);
   std::array<uint32_t, 4> values;
   for (int channel = kR; channel <= kB; ++channel) {
     const double stretch_gain = stretch_gains[channel];
@@ -283,6 +279,7 @@ void WriteG3aaGains(const std::array<double, 4>& stretch_gains, float digital_ga
   output.gain_b = values[kB];
   output.enable = 1;
   output.pixel_order = GetG3aaPixelOrder(bayer_pattern);
+  return OkStatus();
 }
 
 void SetDefaultTuning(zm::BlcTuning& tuning) {

@@ -111,12 +111,14 @@ inline constexpr char kNoDynamicParamText[] = "BlcTuning proto doesn't have dyna
 inline constexpr char kDepthTooLargeText[] = "Sensor bit depth is larger than g3aa pipeline!";
 inline constexpr char kDigitalGainBelowOneText[] = "Digital gain is lower than 1!";
 
-// Writes the four gains of `stretch_gains` (r, gr, gb, b) times `digital_gain`, each product
-// capped at kMaxDigitalGain with one error line per capped channel that begins with
-// `cap_text_prefix`; then enable (always 1) and the pixel order of `bayer_pattern`.
-void WriteG3aaGains(const std::array<double, 4>& stretch_gains, float digital_gain,
-                    vosbrine::BayerPattern bayer_pattern, const char* cap_text_prefix,
-                    tavik_registers::zel::g3aa::DgConfigValue& output);
+// The gain step of both G3AA gain forms: the offsets' stretch gains, the digital gain test, then
+// the four gains, each stretch gain times `digital_gain` capped at kMaxDigitalGain with one error
+// line per capped channel that begins with `cap_text_prefix`; enable (always 1) and the pixel
+// order of `bayer_pattern`.
+Status TranslateG3aaGains(const vosbrine::zelmondrake::BlcTuning& tuning, int32_t sensor_bit_depth,
+                          float digital_gain, vosbrine::BayerPattern bayer_pattern,
+                          const char* cap_text_prefix,
+                          tavik_registers::zel::g3aa::DgConfigValue& output);
 
 // The default tuning of the block, shared by the defaults of both units: enabled, an empty static
 // part, and offsets of 64.0 in each of the four lists of four.

@@ -38,17 +38,8 @@ Status TranslateDg(const TuningBlock& block, const DgInput& input, DgConfigValue
     return InvalidArgumentError("Offsets can't be empty in blc dynamic parameters.");
   }
 
-  std::array<double, 4> offsets;
-  std::array<double, 4> stretch_gains;
-  TAVIK_RETURN_IF_ERROR(
-      CalculateG3AAOffsetGains(*tuning, input.sensor_bit_depth, offsets, stretch_gains));
-  // Also refuses a NaN gain.
-  if (!(input.digital_gain >= 1.0f)) {
-    return InvalidArgumentError(blc_internal::kDigitalGainBelowOneText);
-  }
-  blc_internal::WriteG3aaGains(stretch_gains, input.digital_gain, input.bayer_pattern,
-                               kCapTextPrefix, output);
-  return OkStatus();
+  return blc_internal::TranslateG3aaGains(*tuning, input.sensor_bit_depth, input.digital_gain,
+                                          input.bayer_pattern, kCapTextPrefix, output);
 }
 
 Status GetDefaultDg(DgConfigValue& output) {
