@@ -29,6 +29,10 @@ seeds=()
 if [ -d "fuzz/corpus/$name" ]; then seeds+=("fuzz/corpus/$name"); fi
 case "$name" in
   provider_load_fuzzer|tuning_usecase_data_fuzzer) seeds+=("$build/share/tavik/tuning") ;;
+  translator_table_fuzzer)
+    cmake --build "$build" --target make_translator_seeds
+    "$build/fuzz/make_translator_seeds" "$build/share/tavik/tuning" "$build/seeds/$name"
+    seeds+=("$build/seeds/$name") ;;
 esac
 "$build/fuzz/$name" "$corpus" "${seeds[@]}" -max_total_time="$seconds" \
   -artifact_prefix="$build/artifacts/" -print_final_stats=1 "$@"

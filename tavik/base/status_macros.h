@@ -3,6 +3,7 @@
 #ifndef TAVIK_BASE_STATUS_MACROS_H_
 #define TAVIK_BASE_STATUS_MACROS_H_
 
+#include <optional>
 #include <utility>
 
 #include "absl/base/optimization.h"
@@ -11,28 +12,37 @@
 namespace tavik::status_macro_internal {
 
 // Holds the result of the guarded expression; converts to true when it is OK, so that the macro
-// can be a single if-else statement that a trailing `<<` attaches to.
+// can be a single if-else statement that a trailing `<<` attaches to. A builder is made only on
+// failure: the successful case, which translators run many times per frame, costs a move and a
+// test.
 class StatusAdaptorForMacros {
  public:
   StatusAdaptorForMacros(const Status& status, SourceLocation location)
-      : builder_(status, location) {}
+      : status_(status), location_(location) {}
   StatusAdaptorForMacros(Status&& status, SourceLocation location)
-      : builder_(std::move(status), location) {}
-  StatusAdaptorForMacros(StatusBuilder&& builder, SourceLocation /*location*/)
-      : builder_(std::move(builder)) {}
+      : status_(std::move(status)), location_(location) {}
+  StatusAdaptorForMacros(StatusBuilder&& builder, SourceLocation location)
+      : status_(builder.ok() ? OkStatus() : UnknownError("")),
+        location_(location),
+        builder_(std::move(builder)) {}
   template <typename T>
   StatusAdaptorForMacros(const StatusOr<T>& status_or, SourceLocation location)
-      : builder_(status_or.status(), location) {}
+      : status_(status_or.status()), location_(location) {}
 
   StatusAdaptorForMacros(const StatusAdaptorForMacros&) = delete;
   StatusAdaptorForMacros& operator=(const StatusAdaptorForMacros&) = delete;
 
-  explicit operator bool() const { return ABSL_PREDICT_TRUE(builder_.ok()); }
+  explicit operator bool() const { return ABSL_PREDICT_TRUE(status_.ok()); }
 
-  StatusBuilder&& Consume() { return std::move(builder_); }
+  StatusBuilder Consume() {
+    if (builder_.has_value()) return std::move(*builder_);
+    return StatusBuilder(std::move(status_), location_);
+  }
 
  private:
-  StatusBuilder builder_;
+  Status status_;
+  SourceLocation location_;
+  std::optional<StatusBuilder> builder_;
 };
 
 }  // namespace tavik::status_macro_internal
@@ -42,20 +52,20 @@ class StatusAdaptorForMacros {
 
 // Returns from the enclosing function when `expr` (a Status, StatusOr or StatusBuilder) failed.
 // The enclosing function may return Status or StatusOr<T>.
-#define TAVIK_RETURN_IF_ERROR(expr)                                                   \
-  switch (0)                                                                          \
-  case 0:                                                                             \
-  default:                                                                            \
-    if (::tavik::status_macro_internal::StatusAdaptorForMacros                        \
-            tavik_status_macro_adaptor{(expr), ::tavik::SourceLocation::current()}) { \
-    } else /* NOLINT */                                                               \
+#define TAVIK_RETURN_IF_ERROR(expr)                                                        \
+  switch (0)                                                                               \
+  case 0:                                                                                  \
+  default:                                                                                 \
+    if (::tavik::status_macro_internal::StatusAdaptorForMacros tavik_status_macro_adaptor{ \
+            (expr), ::tavik::SourceLocation::current()}) {                                 \
+    } else /* NOLINT */                                                                    \
       return tavik_status_macro_adaptor.Consume()
 
 // Evaluates `rexpr` (a StatusOr<T>); on failure returns it from the enclosing function, else
 // assigns the value to `lhs`, which may be a declaration (`auto x`).
-#define TAVIK_ASSIGN_OR_RETURN(lhs, rexpr) \
-  TAVIK_ASSIGN_OR_RETURN_IMPL_(            \
-      TAVIK_STATUS_MACROS_CONCAT_(tavik_status_or_value_, __LINE__), lhs, rexpr)
+#define TAVIK_ASSIGN_OR_RETURN(lhs, rexpr)                                                         \
+  TAVIK_ASSIGN_OR_RETURN_IMPL_(TAVIK_STATUS_MACROS_CONCAT_(tavik_status_or_value_, __LINE__), lhs, \
+                               rexpr)
 
 #define TAVIK_ASSIGN_OR_RETURN_IMPL_(statusor, lhs, rexpr)                       \
   auto statusor = (rexpr);                                                       \

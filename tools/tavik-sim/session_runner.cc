@@ -8,7 +8,8 @@
 #include "tavik/base/strings.h"
 #include "tavik/base/trace.h"
 #include "tavik/iq/tuning_provider_base.h"
-#include "tools/common/translator_registry.h"
+#include "tavik/iq/zel/translators/translator_table.h"
+#include "tools/common/hardware_values.h"
 
 namespace tavik::sim {
 namespace {
@@ -76,6 +77,10 @@ std::vector<FrameRecord> RunSession(ZelTuningController& controller,
   std::shared_ptr<TuningBundle> previous_bundle;
   std::shared_ptr<TuningPoint> previous_point;
 
+  // Each form's records are made once and reused frame after frame, as a pipeline node does.
+  std::vector<TranslatorRecords> translations;
+  for (const TranslatorForm* form : TranslatorTable()) translations.emplace_back(*form);
+
   controller.NotifyCaptureSessionOpen();
   for (const SimFrame& frame : frames) {
     FrameRecord& record = records.emplace_back();
@@ -131,17 +136,19 @@ std::vector<FrameRecord> RunSession(ZelTuningController& controller,
 
     {
       StageTimer timer(record, kTranslate);
-      const tools::FrameFacts facts;
-      for (const tools::TranslatorEntry& entry : tools::Translators()) {
-        const TuningBlock* block = bundle ? bundle->GetBlock(entry.block_name) : nullptr;
-        if (block == nullptr) continue;
-        tools::HardwareValues values;
-        if (Status status = entry.run(*block, facts, values); !status.ok()) {
-          record.failures.push_back({std::string(entry.block_name), std::string(status.message())});
+      TranslatorFrame translator_frame;
+      translator_frame.blocks = blocks;
+      for (TranslatorRecords& translation : translations) {
+        const TranslatorForm& form = translation.form();
+        if (blocks[form.block] == nullptr) continue;
+        if (Status status = translation.Translate(translator_frame); !status.ok()) {
+          record.failures.push_back(
+              {std::string(kZelBlockNames[form.block]), std::string(status.message())});
           continue;
         }
-        record.translations.push_back(
-            {std::string(entry.name), std::string(entry.block_name), values.ToJson()});
+        record.translations.push_back({std::string(form.name),
+                                       std::string(kZelBlockNames[form.block]),
+                                       tools::HardwareValues::Of(translation).ToJson()});
       }
     }
 

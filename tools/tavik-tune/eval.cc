@@ -1,5 +1,7 @@
 #include "tools/tavik-tune/eval.h"
 
+#include <algorithm>
+#include <array>
 #include <cstdlib>
 #include <memory>
 
@@ -10,6 +12,7 @@
 #include "tavik/iq/zel/tuning_provider.h"
 #include "tavik/iq/zel/zel_block_list.h"
 #include "tavik/iq/zel/zel_tuning_block.h"
+#include "tools/common/hardware_values.h"
 #include "tools/common/module_calibration_file.h"
 #include "tools/tavik-tune/proto_files.h"
 
@@ -101,8 +104,8 @@ StatusOr<EvalRequest> ParseEvalArgs(const std::vector<std::string>& args) {
         return s;
       }
     } else if (flag == "sensor-type") {
-      if (Status s = ParseEnum(vosbrine::SensorType_descriptor(), value,
-                               &request.frame_facts.sensor_type);
+      if (Status s =
+              ParseEnum(vosbrine::SensorType_descriptor(), value, &request.frame_facts.sensor_type);
           !s.ok()) {
         return s;
       }
@@ -155,15 +158,14 @@ Status RunEval(const EvalRequest& request, std::ostream& out) {
     if (!calibration.ok()) return calibration.status();
     eeprom_data = BuildTuningEepromData(request.device_name, *calibration, /*dump=*/false);
     if (eeprom_data == nullptr) {
-      return InvalidArgumentError(StrCat(request.calibration_path,
-                                         ": no module of a known sensor with a usable grid"));
+      return InvalidArgumentError(
+          StrCat(request.calibration_path, ": no module of a known sensor with a usable grid"));
     }
   }
   StatusOr<std::unique_ptr<vosbrine::zelmondrake::TuningProvider>> provider =
       // Directories expanded here, in the runtime's order, so that "." and ".." don't show up
       // as rejected files.
-      vosbrine::zelmondrake::TuningProvider::Create(ExpandPaths(request.paths),
-                                                    eeprom_data.get());
+      vosbrine::zelmondrake::TuningProvider::Create(ExpandPaths(request.paths), eeprom_data.get());
   if (!provider.ok()) return provider.status();
 
   // Production takes the nearest key; say which one it took.
@@ -182,26 +184,41 @@ Status RunEval(const EvalRequest& request, std::ostream& out) {
   auto keep_first = [&first_failure](const Status& status) {
     if (!status.ok() && first_failure.ok()) first_failure = status;
   };
+  // The blocks of the frame as the controller makes them, typed blocks holding the filled
+  // messages: the printed ones, and with --translate all of them, as a translator may also read
+  // blocks besides its own.
+  std::array<std::unique_ptr<TuningBlock>, kZelBlockCount> blocks;
+  std::array<Status, kZelBlockCount> fill_status;
+  TranslatorFrame frame;
+  frame.facts = request.frame_facts;
+  ForEachZelBlockType([&]<size_t Position, typename T>() {
+    const bool printed =
+        std::any_of(request.blocks.begin(), request.blocks.end(),
+                    [](const BlockType* block) { return block->message == T::descriptor(); });
+    if (!printed && !request.translate) return;
+    auto block = std::make_unique<ZelTuningBlock<T>>();
+    fill_status[Position] = (*provider)->FillSubBlockTuning(
+        request.usecase, request.state, &block->message, /*fallback=*/true, /*bypassed=*/false);
+    if (fill_status[Position].ok()) frame.blocks[Position] = block.get();
+    blocks[Position] = std::move(block);
+  });
   for (const BlockType* block : request.blocks) {
-    // The block as the controller makes it: a typed block holding the filled message.
     ForEachZelBlockType([&]<size_t Position, typename T>() {
       if (T::descriptor() != block->message) return;
-      ZelTuningBlock<T> typed_block;
-      const Status status = (*provider)->FillSubBlockTuning(
-          request.usecase, request.state, &typed_block.message, /*fallback=*/true,
-          /*bypassed=*/false);
+      const Status& status = fill_status[Position];
       out << "# " << block->message->name();
       if (!status.ok()) out << " (failed: " << status.message() << ")";
-      out << "\n" << ToText(typed_block.message);
+      out << "\n" << ToText(static_cast<const ZelTuningBlock<T>&>(*blocks[Position]).message);
       keep_first(status);
       if (!request.translate || !status.ok()) return;
-      for (const tools::TranslatorEntry& translator : tools::Translators()) {
-        if (translator.block_name != block->message->name()) continue;
-        tools::HardwareValues values;
-        const Status translated = translator.run(typed_block, request.frame_facts, values);
-        out << "## " << translator.name;
+      for (const TranslatorForm* form : TranslatorTable()) {
+        if (form->block != Position) continue;
+        TranslatorRecords records(*form);
+        const Status translated = records.Translate(frame);
+        out << "## " << form->name;
         if (!translated.ok()) out << " (failed: " << translated.message() << ")";
-        out << "\n" << values.ToText();
+        out << "\n";
+        if (translated.ok()) out << tools::HardwareValues::Of(records).ToText();
         keep_first(translated);
       }
     });

@@ -10,7 +10,7 @@
 #include "tavik/base/status.h"
 #include "tavik/iq/protos/camera_state.pb.h"
 #include "tavik/iq/protos/tuning_usecase.pb.h"
-#include "tools/common/translator_registry.h"
+#include "tavik/iq/zel/translators/translator_table.h"
 #include "tools/tavik-tune/tuning_files.h"
 
 namespace tavik::tune {
@@ -26,7 +26,7 @@ struct EvalRequest {
   std::string device_name;  // Names the sensors of the calibration: "fennelmoore" or other.
   // Also run every translator of each block, on these frame facts, and print the values.
   bool translate = false;
-  tools::FrameFacts frame_facts;
+  FrameFacts frame_facts;
 };
 
 // Parses "DIR --sensor S --mode M --usecase U [--cct X ...] [--block NAME ...]". Coordinates are

@@ -50,7 +50,8 @@ FlatHashMap<std::string_view, int> BuildBlockNameIndex() {
   for (size_t position = 0; position < kZelBlockNames.size(); ++position) {
     index[kZelBlockNames[position]] = static_cast<int>(position);
   }
-  index["SensorGammaTuning"] = 20;
+  index["SensorGammaTuning"] =
+      static_cast<int>(kZelBlockPosition<vosbrine::zelmondrake::SharpTuning>);
   return index;
 }
 
@@ -84,32 +85,15 @@ struct ZelTuningController::BlockCache {
 };
 
 bool IsSubBlockBypassed(uint32_t bypass_bitmask, std::string_view block_name) {
-  static const auto* const bits = new FlatHashMap<std::string_view, uint32_t>{
-      {"BlcTuning", 0x1},
-      {"CcmTuning", 0x2},
-      {"ClutTuning", 0x4},
-      {"DisparityTuning", 0x8},
-      {"DmscTuning", 0x10},
-      {"DpcTuning", 0x20},
-      {"EdgedetTuning", 0x40},
-      {"GammaTuning", 0x80},
-      {"GtnrSharpenerTuning", 0x100},
-      {"GtnrTuning", 0x200},
-      {"HqdnsTuning", 0x400},
-      {"LscTuning", 0x800},
-      {"LscStatsTuning", 0x1000},
-      {"LtmTuning", 0x2000},
-      {"LtmDeltaYTuning", 0x4000},
-      {"NfltrTuning", 0x8000},
-      {"NsmixTuning", 0x10000},
-      {"PrcTuning", 0x20000},
-      {"RgbYuvConversionTuning", 0x40000},
-      {"SharpTuning", 0x80000},
-      {"SkindTuning", 0x100000},
-      {"SnaddTuning", 0x200000},
-      {"StkTuning", 0x400000},
-      {"WbTuning", 0x800000},
-  };
+  static const auto* const bits = [] {
+    auto* bits = new FlatHashMap<std::string_view, uint32_t>();
+    for (size_t position = 0; position < kZelBlockCount; ++position) {
+      if (kZelBlockBypassBits[position] != 0) {
+        (*bits)[kZelBlockNames[position]] = kZelBlockBypassBits[position];
+      }
+    }
+    return bits;
+  }();
   const auto bit = bits->find(block_name);
   return bit != bits->end() && (bypass_bitmask & bit->second) != 0;
 }
@@ -142,8 +126,7 @@ std::string ZelTuningController::GetInstanceName() const { return kInstanceName;
 std::shared_ptr<TuningPoint> ZelTuningController::CreateTuningPoint(
     const UseCase& use_case, const TuningInfo& tuning_info,
     const TuningCoordinates& coordinates) const {
-  return std::make_shared<ZelTuningPoint>(use_case, tuning_info, coordinates,
-                                          use_bringup_tuning_);
+  return std::make_shared<ZelTuningPoint>(use_case, tuning_info, coordinates, use_bringup_tuning_);
 }
 
 StatusOr<std::shared_ptr<vosbrine::TuningUsecase>> ZelTuningController::GenerateTuningUseCase(
@@ -151,9 +134,8 @@ StatusOr<std::shared_ptr<vosbrine::TuningUsecase>> ZelTuningController::Generate
   auto usecase = std::make_shared<vosbrine::TuningUsecase>(DefaultTuningUsecase());
   if (point.use_bringup_tuning) return usecase;
   // One part that can't be mapped discards the others: the default is taken whole.
-  const vosbrine::CameraSensor sensor =
-      ConvertToCameraSensor(device_name, point.tuning_info.sensor_mode_info.sensor_name,
-                            point.tuning_info.module_spec);
+  const vosbrine::CameraSensor sensor = ConvertToCameraSensor(
+      device_name, point.tuning_info.sensor_mode_info.sensor_name, point.tuning_info.module_spec);
   if (sensor == vosbrine::INVALID_CAMERA_SENSOR) {
     TAVIK_LOG_EVERY_N_SEC(WARNING, kWarningPeriodSeconds) << "INVALID_CAMERA_SENSOR. Using default";
     return usecase;
@@ -300,7 +282,8 @@ void ZelTuningController::NotifyCaptureSessionOpen() {
   std::lock_guard<std::mutex> lock(session_mutex_);
   if (session_count_++ == 0) {
     tuning_point_queue_ = std::make_unique<WaitQueue<std::shared_ptr<TuningPoint>>>();
-    signal_thread_ = std::make_unique<std::thread>(&ZelTuningController::SignalThreadFunction, this);
+    signal_thread_ =
+        std::make_unique<std::thread>(&ZelTuningController::SignalThreadFunction, this);
   }
 }
 

@@ -10,6 +10,8 @@
 #include "tavik/base/status_macros.h"
 #include "tavik/base/trace.h"
 #include "tavik/iq/zel/translators/bayer_pattern_util.h"
+#include "tavik/iq/zel/translators/internal/black_level_gains.h"
+#include "tavik/iq/zel/translators/translator_table.h"
 #include "tavik/iq/zel/translators/translator_util.h"
 #include "tavik/iq/zel/zel_tuning_block.h"
 
@@ -71,12 +73,27 @@ float DepthScale(int32_t full_bits, int32_t sensor_bit_depth) {
 
 constexpr BlcInput kDefaultInput = {vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 1.0f};
 
+using black_level_internal::SetDefaultTuning;
+
+// The frame's facts as the black-level stages take them.
+BlcInput BlcInputOf(const FrameFacts& facts) {
+  return {facts.bayer_pattern, facts.sensor_type, facts.sensor_bit_depth, facts.digital_gain};
+}
+
+// Constants of the configuration, written by word.
+void WriteFixedOutput(BlcIppFixedOutput& fixed) {
+  fixed = BlcIppFixedOutput{};
+  fixed.range_high = 16383;
+  TAVIK_SET_FIELD(fixed, range_low, -16383);
+}
+
 }  // namespace
 
 Status TranslateBlc(const TuningBlock& block, const BlcInput& input, BlcIppOutput& output) {
   PerfTrace trace(kTranslatorTraceCategory, "TranslateBlc");
-  const zm::BlcTuning* tuning = GetTuningProto<zm::BlcTuning>(block);
-  TAVIK_RETURN_IF_ERROR(CheckTuning(tuning));
+  TAVIK_ASSIGN_OR_RETURN(const zm::BlcTuning* tuning, RequireTuning<zm::BlcTuning>(block));
+  TAVIK_RETURN_IF_ERROR(RequireDynamic(*tuning));
+  TAVIK_RETURN_IF_ERROR(RequireStatic(*tuning));
   if (input.sensor_bit_depth < 1 || input.sensor_bit_depth > 16) {
     return InvalidArgumentErrorBuilder()
            << "Sensor bit depth doesn't match with hardware pipeline " << input.sensor_bit_depth;
@@ -151,7 +168,8 @@ Status CalculateG3AAOffsetGains(const zm::BlcTuning& tuning, int32_t sensor_bit_
                                 std::array<double, 4>& offsets,
                                 std::array<double, 4>& stretch_gains) {
   if (sensor_bit_depth >= 16) {
-    return InvalidArgumentErrorBuilder() << blc_internal::kDepthTooLargeText << sensor_bit_depth;
+    return InvalidArgumentErrorBuilder()
+           << black_level_internal::kDepthTooLargeText << sensor_bit_depth;
   }
   const float scale = DepthScale(15, sensor_bit_depth);
   const zm::BlcDynamicParam& dynamic = tuning.dynamic_param();
@@ -171,66 +189,51 @@ Status CalculateG3AAOffsetGains(const zm::BlcTuning& tuning, int32_t sensor_bit_
 
 Status TranslateBlc(const TuningBlock& block, const BlcInput& input, BlcConfigValue* output) {
   PerfTrace trace(kTranslatorTraceCategory, "TranslateBlc");
-  if (output == nullptr) return InvalidArgumentError(kOutputIsNullText);
-  const zm::BlcTuning* tuning = GetTuningProto<zm::BlcTuning>(block);
-  if (tuning == nullptr) return InvalidArgumentError(kInvalidTuningBlockText);
-  if (!tuning->has_static_param()) {
-    return InvalidArgumentError("BlcTuning proto doesn't have static param!");
-  }
+  TAVIK_RETURN_IF_ERROR(RequireOutput(output));
+  TAVIK_ASSIGN_OR_RETURN(const zm::BlcTuning* tuning, RequireTuning<zm::BlcTuning>(block));
+  TAVIK_RETURN_IF_ERROR(RequireStatic(*tuning, "BlcTuning proto doesn't have static param!"));
   output->enable = tuning->enable() ? 1 : 0;
   output->pixel_order = GetG3aaPixelOrder(input.bayer_pattern);
-  if (!tuning->has_dynamic_param()) {
-    return InvalidArgumentError(blc_internal::kNoDynamicParamText);
-  }
+  TAVIK_RETURN_IF_ERROR(RequireDynamic(*tuning, black_level_internal::kNoDynamicParamText));
 
   std::array<double, 4> offsets;
   std::array<double, 4> stretch_gains;
   TAVIK_RETURN_IF_ERROR(
       CalculateG3AAOffsetGains(*tuning, input.sensor_bit_depth, offsets, stretch_gains));
-  output->offset_r = LowBits(TruncateWrapping(offsets[kR]), 16);
-  output->offset_gr = LowBits(TruncateWrapping(offsets[kGr]), 16);
-  output->offset_gb = LowBits(TruncateWrapping(offsets[kGb]), 16);
-  output->SetOffsetB(static_cast<uint32_t>(LowBits(TruncateWrapping(offsets[kB]), 16)));
+  TAVIK_SET_FIELD(*output, offset_r, TruncateWrapping(offsets[kR]));
+  TAVIK_SET_FIELD(*output, offset_gr, TruncateWrapping(offsets[kGr]));
+  TAVIK_SET_FIELD(*output, offset_gb, TruncateWrapping(offsets[kGb]));
+  output->SetOffsetB(static_cast<uint64_t>(TruncateWrapping(offsets[kB])));
   return OkStatus();
 }
 
 Status TranslateBlc(const TuningBlock& block, const BlcInput& input, DgConfigValue* output) {
   PerfTrace trace(kTranslatorTraceCategory, "TranslateBlc");
-  if (output == nullptr) return InvalidArgumentError(kOutputIsNullText);
-  const zm::BlcTuning* tuning = GetTuningProto<zm::BlcTuning>(block);
-  if (tuning == nullptr) return InvalidArgumentError(kInvalidTuningBlockText);
-  if (!tuning->has_dynamic_param()) {
-    return InvalidArgumentError(blc_internal::kNoDynamicParamText);
-  }
-
-  return blc_internal::TranslateG3aaGains(*tuning, input.sensor_bit_depth, input.digital_gain,
-                                          input.bayer_pattern, kCapTextPrefix, *output);
+  TAVIK_RETURN_IF_ERROR(RequireOutput(output));
+  TAVIK_ASSIGN_OR_RETURN(const zm::BlcTuning* tuning, RequireTuning<zm::BlcTuning>(block));
+  TAVIK_RETURN_IF_ERROR(RequireDynamic(*tuning, black_level_internal::kNoDynamicParamText));
+  return black_level_internal::TranslateG3aaGains(*tuning, input.sensor_bit_depth,
+                                                  input.digital_gain, input.bayer_pattern,
+                                                  kCapTextPrefix, *output);
 }
 
 Status GetDefaultBlc(BlcIppOutput& output, BlcIppFixedOutput& fixed) {
-  PerfTrace trace(kTranslatorTraceCategory, "GetDefaultBlc");
-  ZelTuningBlock<zm::BlcTuning> block;
-  blc_internal::SetDefaultTuning(block.message);
-  TAVIK_RETURN_IF_ERROR(TranslateBlc(block, kDefaultInput, output));
-  // Constants of the configuration, written by word.
-  fixed = BlcIppFixedOutput{};
-  fixed.range_high = 16383;
-  fixed.range_low = LowBits(-16383, 15);
-  return OkStatus();
+  return GetDefault(
+      "GetDefaultBlc", SetDefaultTuning,
+      [&](const TuningBlock& block) { return TranslateBlc(block, kDefaultInput, output); },
+      [&] { WriteFixedOutput(fixed); });
 }
 
 Status GetDefaultBlc(BlcConfigValue* output) {
-  PerfTrace trace(kTranslatorTraceCategory, "GetDefaultBlc");
-  ZelTuningBlock<zm::BlcTuning> block;
-  blc_internal::SetDefaultTuning(block.message);
-  return TranslateBlc(block, kDefaultInput, output);
+  return GetDefault("GetDefaultBlc", SetDefaultTuning, [&](const TuningBlock& block) {
+    return TranslateBlc(block, kDefaultInput, output);
+  });
 }
 
 Status GetDefaultBlc(DgConfigValue* output) {
-  PerfTrace trace(kTranslatorTraceCategory, "GetDefaultBlc");
-  ZelTuningBlock<zm::BlcTuning> block;
-  blc_internal::SetDefaultTuning(block.message);
-  return TranslateBlc(block, kDefaultInput, output);
+  return GetDefault("GetDefaultBlc", SetDefaultTuning, [&](const TuningBlock& block) {
+    return TranslateBlc(block, kDefaultInput, output);
+  });
 }
 
 std::array<float, 4> GetDynamicBlc(const TuningBlock& block, vosbrine::BayerPattern bayer_pattern) {
@@ -247,52 +250,20 @@ std::array<float, 4> GetDynamicBlc(const TuningBlock& block, vosbrine::BayerPatt
           FirstOffset(Offsets(dynamic, quad_channels[3]))};
 }
 
-namespace blc_internal {
+namespace translator_forms {
 
-Status TranslateG3aaGains(const zm::BlcTuning& tuning, int32_t sensor_bit_depth, float digital_gain,
-                          vosbrine::BayerPattern bayer_pattern, const char* cap_text_prefix,
-                          DgConfigValue& output) {
-  std::array<double, 4> offsets;
-  std::array<double, 4> stretch_gains;
-  TAVIK_RETURN_IF_ERROR(CalculateG3AAOffsetGains(tuning, sensor_bit_depth, offsets, stretch_gains));
-  // Also refuses a NaN gain.
-  if (!(digital_gain >= 1.0f)) return InvalidArgumentError(kDigitalGainBelowOneText);
-  std::array<uint32_t, 4> values;
-  for (int channel = kR; channel <= kB; ++channel) {
-    const double stretch_gain = stretch_gains[channel];
-    float gain = digital_gain;
-    if (stretch_gain * gain > kMaxDigitalGain) {
-      gain = static_cast<float>(kMaxDigitalGain / stretch_gain);
-      TAVIK_LOG(ERROR) << cap_text_prefix << kMaxDigitalGain
-                       << ". If not, it is capped to kMaxDigitalGain: " << digital_gain << " "
-                       << stretch_gain;
-    }
-    uint32_t value = TruncateToUint32(stretch_gain * gain * 65536.0);
-    // Never a zero gain, and nothing beyond the Q8.16 range's top.
-    if (value == 0) value = 1;
-    if (value > 0x1000000u) value = 0x1000000u;
-    values[channel] = static_cast<uint32_t>(LowBits(value, 24));
-  }
-  output.gain_r = values[kR];
-  output.gain_gr = values[kGr];
-  output.SetGainGb(values[kGb]);
-  output.gain_b = values[kB];
-  output.enable = 1;
-  output.pixel_order = GetG3aaPixelOrder(bayer_pattern);
-  return OkStatus();
-}
+constexpr TranslatorForm kBlcIpp = MakeTranslatorForm<zm::BlcTuning, BlcIppOutput>(
+    "TranslateBlc (IPP)", [](const TranslatorFrame& frame, BlcIppOutput& output) {
+      return TranslateBlc(frame.Block<zm::BlcTuning>(), BlcInputOf(frame.facts), output);
+    });
+constexpr TranslatorForm kBlcG3aaOffsets = MakeTranslatorForm<zm::BlcTuning, BlcConfigValue>(
+    "TranslateBlc (G3AA offsets)", [](const TranslatorFrame& frame, BlcConfigValue& output) {
+      return TranslateBlc(frame.Block<zm::BlcTuning>(), BlcInputOf(frame.facts), &output);
+    });
+constexpr TranslatorForm kBlcG3aaGains = MakeTranslatorForm<zm::BlcTuning, DgConfigValue>(
+    "TranslateBlc (G3AA gains)", [](const TranslatorFrame& frame, DgConfigValue& output) {
+      return TranslateBlc(frame.Block<zm::BlcTuning>(), BlcInputOf(frame.facts), &output);
+    });
 
-void SetDefaultTuning(zm::BlcTuning& tuning) {
-  tuning.set_enable(true);
-  tuning.mutable_static_param();
-  zm::BlcDynamicParam& dynamic = *tuning.mutable_dynamic_param();
-  for (google::protobuf::RepeatedField<float>* offsets :
-       {dynamic.mutable_offsets_r(), dynamic.mutable_offsets_gr(), dynamic.mutable_offsets_gb(),
-        dynamic.mutable_offsets_b()}) {
-    offsets->Reserve(4);
-    for (int k = 0; k < 4; ++k) offsets->Add(64.0f);
-  }
-}
-
-}  // namespace blc_internal
+}  // namespace translator_forms
 }  // namespace tavik

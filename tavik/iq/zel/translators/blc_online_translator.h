@@ -12,7 +12,6 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
-#include <type_traits>
 
 #include "tavik/base/status.h"
 #include "tavik/base/tuning_block.h"
@@ -20,6 +19,7 @@
 #include "tavik/iq/protos/common.pb.h"
 #include "tavik/iq/zel/protos/blc_param.pb.h"
 #include "tavik/iq/zel/translators/g3aa_blc_registers.h"
+#include "tavik/iq/zel/translators/record_description.h"
 
 namespace tavik {
 
@@ -55,7 +55,9 @@ struct BlcIppOutput {
 static_assert(sizeof(BlcIppOutput) == 76);
 static_assert(offsetof(BlcIppOutput, offsets) == 12);
 static_assert(offsetof(BlcIppOutput, gains) == 44);
-static_assert(std::is_standard_layout_v<BlcIppOutput>);
+TAVIK_DESCRIBE_RECORD(BlcIppOutput, 32, TAVIK_FIELD(bypass), TAVIK_FIELD(tile_mode),
+                      TAVIK_FIELD(gain_integer_bits), TAVIK_TABLE(offsets, 15),
+                      TAVIK_TABLE(gains, 15));
 
 // The IPP stage's values that no tuning drives, written by GetDefaultBlc alone.
 struct BlcIppFixedOutput {
@@ -70,7 +72,8 @@ struct BlcIppFixedOutput {
 };
 static_assert(sizeof(BlcIppFixedOutput) == 40);
 static_assert(offsetof(BlcIppFixedOutput, reserved) == 8);
-static_assert(std::is_standard_layout_v<BlcIppFixedOutput>);
+TAVIK_DESCRIBE_RECORD(BlcIppFixedOutput, 32, TAVIK_FIELD(range_high), TAVIK_FIELD(range_low),
+                      TAVIK_TABLE(reserved, 32));
 
 // IPP. Fails on an empty tuning, a sensor depth outside 1..16, offset arrays other than 4 values
 // each (after bypass and tile_mode are written) and a digital gain below 1 (after the offsets
@@ -104,27 +107,14 @@ TAVIK_EXPORT Status CalculateG3AAOffsetGains(const vosbrine::zelmondrake::BlcTun
                                              std::array<double, 4>& offsets,
                                              std::array<double, 4>& stretch_gains);
 
-namespace blc_internal {
+// The unit's rows of the translator table.
+struct TranslatorForm;
+namespace translator_forms {
+extern const TranslatorForm kBlcIpp;
+extern const TranslatorForm kBlcG3aaOffsets;
+extern const TranslatorForm kBlcG3aaGains;
+}  // namespace translator_forms
 
-// Shared by the G3AA gain forms of TranslateBlc and TranslateDg.
-inline constexpr char kNoDynamicParamText[] = "BlcTuning proto doesn't have dynamic param!";
-inline constexpr char kDepthTooLargeText[] = "Sensor bit depth is larger than g3aa pipeline!";
-inline constexpr char kDigitalGainBelowOneText[] = "Digital gain is lower than 1!";
-
-// The gain step of both G3AA gain forms: the offsets' stretch gains, the digital gain test, then
-// the four gains, each stretch gain times `digital_gain` capped at kMaxDigitalGain with one error
-// line per capped channel that begins with `cap_text_prefix`; enable (always 1) and the pixel
-// order of `bayer_pattern`.
-Status TranslateG3aaGains(const vosbrine::zelmondrake::BlcTuning& tuning, int32_t sensor_bit_depth,
-                          float digital_gain, vosbrine::BayerPattern bayer_pattern,
-                          const char* cap_text_prefix,
-                          tavik_registers::zel::g3aa::DgConfigValue& output);
-
-// The default tuning of the block, shared by the defaults of both units: enabled, an empty static
-// part, and offsets of 64.0 in each of the four lists of four.
-void SetDefaultTuning(vosbrine::zelmondrake::BlcTuning& tuning);
-
-}  // namespace blc_internal
 }  // namespace tavik
 
 #endif  // TAVIK_IQ_ZEL_TRANSLATORS_BLC_ONLINE_TRANSLATOR_H_

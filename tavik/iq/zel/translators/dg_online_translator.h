@@ -31,6 +31,12 @@ TAVIK_EXPORT Status TranslateDg(const TuningBlock& block, const DgInput& input,
 // The gains of the default tuning (offsets of 64 at 10 bits, RGGB, digital gain 1).
 TAVIK_EXPORT Status GetDefaultDg(tavik_registers::zel::g3aa::DgConfigValue& output);
 
+// The unit's row of the translator table.
+struct TranslatorForm;
+namespace translator_forms {
+extern const TranslatorForm kDg;
+}  // namespace translator_forms
+
 }  // namespace tavik
 
 #endif  // TAVIK_IQ_ZEL_TRANSLATORS_DG_ONLINE_TRANSLATOR_H_

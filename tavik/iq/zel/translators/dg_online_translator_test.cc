@@ -4,7 +4,6 @@
 #include <cstdint>
 #include <cstring>
 #include <limits>
-#include <mutex>
 #include <string>
 #include <utility>
 #include <vector>
@@ -14,6 +13,7 @@
 #include "tavik/base/testing/log_capture.h"
 #include "tavik/base/testing/status_matchers.h"
 #include "tavik/base/trace.h"
+#include "tavik/iq/testing/translator_testing.h"
 #include "tavik/iq/zel/zel_tuning_block.h"
 
 namespace tavik {
@@ -26,13 +26,12 @@ using ::testing::ElementsAre;
 using ::testing::IsEmpty;
 
 namespace zm = ::vosbrine::zelmondrake;
+using ::tavik::test::ForeignBlock;
+using ::tavik::test::PatternFilled;
+using ::tavik::test::RecordingTraceSink;
+using ::tavik::test::SameBytes;
 
 constexpr absl::StatusCode kInvalid = absl::StatusCode::kInvalidArgument;
-
-class ForeignBlock : public TuningBlock {
- public:
-  std::string GetName() const override { return "Foreign"; }
-};
 
 zm::BlcTuning MakeTuning(std::vector<float> r, std::vector<float> gr, std::vector<float> gb,
                          std::vector<float> b, bool enable = true) {
@@ -56,20 +55,12 @@ ZelTuningBlock<zm::BlcTuning> Block(zm::BlcTuning tuning) {
   return ZelTuningBlock<zm::BlcTuning>(std::move(tuning));
 }
 
-DgConfigValue Filled() {
-  DgConfigValue value;
-  std::memset(&value, 0xA5, sizeof(value));
-  return value;
-}
+DgConfigValue Filled() { return PatternFilled<DgConfigValue>(); }
 
 std::array<uint64_t, 2> Words(const DgConfigValue& value) {
   std::array<uint64_t, 2> words;
   std::memcpy(words.data(), &value, sizeof(value));
   return words;
-}
-
-bool SameBytes(const DgConfigValue& a, const DgConfigValue& b) {
-  return std::memcmp(&a, &b, sizeof(a)) == 0;
 }
 
 TEST(GetDefaultDgTest, GainsAre69905AndWordOneHighBitsSurvive) {
@@ -84,29 +75,10 @@ TEST(GetDefaultDgTest, GainsAre69905AndWordOneHighBitsSurvive) {
   EXPECT_THAT(Words(value), ElementsAre(0x8888088888088889u, 0xA5A5A5A008888808u));
 }
 
-class RecordingSink : public TraceSink {
- public:
-  void OnSpan(const TraceSpan& span) override {
-    std::lock_guard<std::mutex> lock(mutex_);
-    spans_.push_back({span.category, std::string(span.name)});
-  }
-  std::vector<std::pair<int, std::string>> spans() const {
-    std::lock_guard<std::mutex> lock(mutex_);
-    return spans_;
-  }
-
- private:
-  mutable std::mutex mutex_;
-  std::vector<std::pair<int, std::string>> spans_;
-};
-
 TEST(GetDefaultDgTest, TracesItselfAroundTheTranslation) {
-  RecordingSink sink;
-  SetTraceSink(&sink);
+  RecordingTraceSink sink;
   DgConfigValue value;
-  const Status status = GetDefaultDg(value);
-  SetTraceSink(nullptr);
-  TAVIK_ASSERT_OK(status);
+  TAVIK_ASSERT_OK(GetDefaultDg(value));
   EXPECT_THAT(sink.spans(), ElementsAre(std::pair<int, std::string>(5, "TranslateDg"),
                                         std::pair<int, std::string>(5, "GetDefaultDg")));
 }

@@ -7,6 +7,8 @@
 #include <cstdint>
 #include <type_traits>
 
+#include "tavik/iq/zel/translators/record_description.h"
+
 namespace tavik_registers::zel::g3aa {
 
 // Offsets per colour, unsigned, in the stage's 15-bit sample domain. `offset_b` straddles the two
@@ -23,17 +25,12 @@ struct BlcConfigValue {
   uint64_t offset_b_hi : 3;
   uint64_t : 61;
 
-  constexpr uint32_t OffsetB() const {
-    return static_cast<uint32_t>(offset_b_lo | (offset_b_hi << 13));
-  }
-  constexpr void SetOffsetB(uint32_t value) {
-    offset_b_lo = value & 0x1FFF;
-    offset_b_hi = (value >> 13) & 0x7;
-  }
+  TAVIK_SPLIT_FIELD_ACCESSORS(uint32_t, OffsetB, SetOffsetB, offset_b)
 };
 static_assert(sizeof(BlcConfigValue) == 16);
-static_assert(std::is_standard_layout_v<BlcConfigValue>);
-static_assert(std::is_trivially_copyable_v<BlcConfigValue>);
+TAVIK_DESCRIBE_RECORD(BlcConfigValue, 64, TAVIK_FIELD(enable), TAVIK_FIELD(pixel_order),
+                      TAVIK_FIELD(offset_r), TAVIK_FIELD(offset_gr), TAVIK_FIELD(offset_gb),
+                      TAVIK_SPLIT_FIELD(offset_b));
 
 // Gains per colour, unsigned Q8.16. `gain_gb` straddles the two words: its low 13 bits end word 0,
 // its high 11 bits start word 1. Bits 35-63 of word 1 belong to other uses and are left as found.
@@ -49,17 +46,12 @@ struct DgConfigValue {
   uint64_t gain_b : 24;
   uint64_t : 29;
 
-  constexpr uint32_t GainGb() const {
-    return static_cast<uint32_t>(gain_gb_lo | (gain_gb_hi << 13));
-  }
-  constexpr void SetGainGb(uint32_t value) {
-    gain_gb_lo = value & 0x1FFF;
-    gain_gb_hi = (value >> 13) & 0x7FF;
-  }
+  TAVIK_SPLIT_FIELD_ACCESSORS(uint32_t, GainGb, SetGainGb, gain_gb)
 };
 static_assert(sizeof(DgConfigValue) == 16);
-static_assert(std::is_standard_layout_v<DgConfigValue>);
-static_assert(std::is_trivially_copyable_v<DgConfigValue>);
+TAVIK_DESCRIBE_RECORD(DgConfigValue, 64, TAVIK_FIELD(enable), TAVIK_FIELD(pixel_order),
+                      TAVIK_FIELD(gain_r), TAVIK_FIELD(gain_gr), TAVIK_SPLIT_FIELD(gain_gb),
+                      TAVIK_FIELD(gain_b));
 
 }  // namespace tavik_registers::zel::g3aa
 

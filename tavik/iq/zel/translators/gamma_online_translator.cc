@@ -6,6 +6,7 @@
 #include <cstdlib>
 #include <initializer_list>
 #include <iterator>
+#include <span>
 #include <type_traits>
 #include <utility>
 
@@ -14,6 +15,8 @@
 #include "tavik/base/status_macros.h"
 #include "tavik/base/strings.h"
 #include "tavik/base/trace.h"
+#include "tavik/iq/zel/translators/internal/gamma_curves.h"
+#include "tavik/iq/zel/translators/translator_table.h"
 #include "tavik/iq/zel/translators/translator_util.h"
 #include "tavik/iq/zel/zel_tuning_block.h"
 
@@ -61,38 +64,23 @@ uint16_t G3aaCode(float value) {
   return static_cast<uint16_t>(ToFixedPoint(std::clamp(value, 0.0f, 1.0f), 15, 0, kG3aaMax));
 }
 
-// A knot table `x` and the place where the last lower bound ended, so that a rising run of
-// samples searches only forward.
-class KnotCursor {
- public:
-  explicit KnotCursor(const Floats& x) : x_(x) {}
+std::span<const float> Knots(const Floats& values) {
+  return {values.data(), static_cast<size_t>(values.size())};
+}
 
-  // Brackets `sample` between knots k-1 and k: k is the first knot not below the sample, or the
-  // first or last bracket for samples beyond the ends. Fails when that bracket does not rise.
-  Status Bracket(float sample, int* k, float* weight_of_lower) {
-    const int found =
-        static_cast<int>(std::lower_bound(x_.begin() + start_, x_.end(), sample) - x_.begin());
-    start_ = found;
-    const int upper = found == 0 ? 1 : found == x_.size() ? x_.size() - 1 : found;
-    const float x1 = x_.Get(upper);
-    const float x0 = x_.Get(upper - 1);
-    if (x1 <= x0) {
-      return InvalidArgumentErrorBuilder() << StrCat("gamma_x[", upper, "] must be larger than [",
-                                                     upper - 1, "] in tuning data. ", x1, " ", x0);
-    }
-    *k = upper;
-    *weight_of_lower = (x1 - sample) / (x1 - x0);
-    return OkStatus();
-  }
+// The failure of a sample whose bracket in the knot table `x` does not rise. Tested inline, as
+// one status per sample would cost more than the search itself.
+Status BracketFailure(const Floats& x, const KnotBracket& bracket) {
+  const int upper = bracket.upper;
+  return InvalidArgumentErrorBuilder()
+         << StrCat("gamma_x[", upper, "] must be larger than [", upper - 1, "] in tuning data. ",
+                   x.Get(upper), " ", x.Get(upper - 1));
+}
 
- private:
-  const Floats& x_;
-  int start_ = 0;
-};
-
-// The curve value between knots k-1 and k, clamped to 0..1.
-float Interpolate(const Floats& y, int k, float weight_of_lower) {
-  const float value = weight_of_lower * y.Get(k - 1) + (1.0f - weight_of_lower) * y.Get(k);
+// The curve value in `bracket`, clamped to 0..1.
+float Interpolate(const Floats& y, const KnotBracket& bracket) {
+  const float value =
+      InterpolateKnots(bracket.weight_of_lower, y.Get(bracket.upper - 1), y.Get(bracket.upper));
   return std::clamp(value, 0.0f, 1.0f);
 }
 
@@ -159,6 +147,21 @@ int32_t LastStep(const uint16_t (&points)[kItpPoints], uint16_t last) {
 
 uint16_t LimitedMagnitude(int32_t step) {
   return static_cast<uint16_t>(std::min<int64_t>(std::abs(step), kItpOne));
+}
+
+// The defaults' request: the tuning rules, with an empty curve.
+Tonemap TuningTonemap() {
+  Tonemap tonemap;
+  tonemap.mode = TonemapMode::kHighQuality;
+  return tonemap;
+}
+
+// The frame's request as far as its facts tell it: who rules the curve. An application curve is
+// not one of a frame's facts, so the table runs the application's mode with an empty curve.
+Tonemap TonemapOf(const FrameFacts& facts) {
+  Tonemap tonemap;
+  tonemap.mode = facts.tonemap_mode;
+  return tonemap;
 }
 
 }  // namespace
@@ -242,7 +245,7 @@ StatusOr<GammaTuning> GenerateTuningParams(const TonemapCurve& curve) {
                          "].x in tuning data. ", x1, " ", x0);
       }
       const float t = (x1 - x) / (x1 - x0);
-      const float y = t * y0 + (1.0f - t) * y1;
+      const float y = InterpolateKnots(t, y0, y1);
       channel.samples->Set(i, std::clamp(y, 0.0f, 1.0f));
     }
   }
@@ -261,27 +264,26 @@ StatusOr<TonemapCurve> ResampleTonemap(const GammaTuning& tuning, int sample_cou
   curve.red.reserve(count);
   curve.green.reserve(count);
   curve.blue.reserve(count);
-  KnotCursor cursor(x);
+  KnotCursor cursor(Knots(x));
   const float last = static_cast<float>(sample_count - 1);
   for (int i = 0; i < sample_count; ++i) {
     const float sample = static_cast<float>(i) / last;
-    int k = 0;
-    float weight = 0.0f;
-    TAVIK_RETURN_IF_ERROR(cursor.Bracket(sample, &k, &weight));
-    curve.red.push_back({sample, Interpolate(r, k, weight)});
-    curve.green.push_back({sample, Interpolate(g, k, weight)});
-    curve.blue.push_back({sample, Interpolate(b, k, weight)});
+    const KnotBracket bracket = cursor.Find(sample);
+    if (!bracket.rises) return BracketFailure(x, bracket);
+    curve.red.push_back({sample, Interpolate(r, bracket)});
+    curve.green.push_back({sample, Interpolate(g, bracket)});
+    curve.blue.push_back({sample, Interpolate(b, bracket)});
   }
   return curve;
 }
 
-void SetDefaultTuning(GammaTuning* tuning) {
-  tuning->Clear();
-  tuning->set_enable(true);
-  Floats* gamma_x = tuning->mutable_static_param()->mutable_gamma_x();
+void SetDefaultTuning(GammaTuning& tuning) {
+  tuning.Clear();
+  tuning.set_enable(true);
+  Floats* gamma_x = tuning.mutable_static_param()->mutable_gamma_x();
   gamma_x->Reserve(kItpKnots);
   for (int i = 0; i < kItpKnots; ++i) gamma_x->Add(static_cast<float>(i) / 64.0f);
-  auto* dynamic_param = tuning->mutable_dynamic_param();
+  auto* dynamic_param = tuning.mutable_dynamic_param();
   for (Floats* curve : {dynamic_param->mutable_gamma_r(), dynamic_param->mutable_gamma_g(),
                         dynamic_param->mutable_gamma_b()}) {
     curve->Add(std::begin(kDefaultGammaCurve), std::end(kDefaultGammaCurve));
@@ -352,37 +354,50 @@ Status TranslateGamma(const TuningBlock& block, const Tonemap& tonemap, GammaCon
   const Floats& x = tuning.static_param().gamma_x();
   const Floats& g = tuning.dynamic_param().gamma_g();
   TAVIK_RETURN_IF_ERROR(CheckCurveLengths(tuning, {&g}));
-  KnotCursor cursor(x);
+  KnotCursor cursor(Knots(x));
   for (int i = 0; i < gamma_internal::kG3aaGammaKnotCount; ++i) {
-    int k = 0;
-    float weight = 0.0f;
-    TAVIK_RETURN_IF_ERROR(cursor.Bracket(gamma_internal::kG3aaGammaKnots[i], &k, &weight));
-    lut.gamma_lut_values[i] = G3aaCode(Interpolate(g, k, weight));
+    const KnotBracket bracket = cursor.Find(gamma_internal::kG3aaGammaKnots[i]);
+    if (!bracket.rises) return BracketFailure(x, bracket);
+    lut.gamma_lut_values[i] = G3aaCode(Interpolate(g, bracket));
   }
   static_assert(gamma_internal::kG3aaGammaKnotCount <= kG3aaLutSlots);
   return OkStatus();
 }
 
 Status GetDefaultGamma(GammaItpOutput& output, GammaItpFixedOutput& fixed) {
-  PerfTrace trace(kTranslatorTraceCategory, "GetDefaultGamma");
+  // The fixed fields are cleared first, whatever the translation gives; the record's other bits
+  // stay as they were.
   fixed.flag = 0;
   fixed.value_0 = 0;
   fixed.value_1 = 0;
-  ZelTuningBlock<GammaTuning> block;
-  gamma_internal::SetDefaultTuning(&block.message);
-  Tonemap tonemap;
-  tonemap.mode = TonemapMode::kHighQuality;
-  TonemapCurve discarded;
-  return TranslateGamma(block, tonemap, output, discarded);
+  return GetDefault("GetDefaultGamma", gamma_internal::SetDefaultTuning,
+                    [&](const TuningBlock& block) {
+                      TonemapCurve discarded;
+                      return TranslateGamma(block, TuningTonemap(), output, discarded);
+                    });
 }
 
 Status GetDefaultGamma(GammaConfigValue& config, GammaLutValue& lut) {
-  PerfTrace trace(kTranslatorTraceCategory, "GetDefaultGamma");
-  ZelTuningBlock<GammaTuning> block;
-  gamma_internal::SetDefaultTuning(&block.message);
-  Tonemap tonemap;
-  tonemap.mode = TonemapMode::kHighQuality;
-  return TranslateGamma(block, tonemap, config, lut);
+  return GetDefault("GetDefaultGamma", gamma_internal::SetDefaultTuning,
+                    [&](const TuningBlock& block) {
+                      return TranslateGamma(block, TuningTonemap(), config, lut);
+                    });
 }
 
+namespace translator_forms {
+
+constexpr TranslatorForm kGammaItp = MakeTranslatorForm<GammaTuning, GammaItpOutput>(
+    "TranslateGamma (ITP)", [](const TranslatorFrame& frame, GammaItpOutput& output) {
+      // The curve handed back is the caller's business; the tools and the table keep none.
+      TonemapCurve curve;
+      return TranslateGamma(frame.Block<GammaTuning>(), TonemapOf(frame.facts), output, curve);
+    });
+constexpr TranslatorForm kGammaG3aa =
+    MakeTranslatorForm<GammaTuning, GammaConfigValue, GammaLutValue>(
+        "TranslateGamma (G3AA)",
+        [](const TranslatorFrame& frame, GammaConfigValue& config, GammaLutValue& lut) {
+          return TranslateGamma(frame.Block<GammaTuning>(), TonemapOf(frame.facts), config, lut);
+        });
+
+}  // namespace translator_forms
 }  // namespace tavik

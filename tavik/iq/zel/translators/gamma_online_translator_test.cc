@@ -6,33 +6,30 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
-#include <filesystem>
-#include <mutex>
 #include <string>
 #include <utility>
 #include <vector>
 
 #include "gmock/gmock.h"
-#include "google/protobuf/any.pb.h"
 #include "gtest/gtest.h"
 #include "tavik/base/camera_types.h"
 #include "tavik/base/status.h"
 #include "tavik/base/testing/log_capture.h"
 #include "tavik/base/testing/status_matchers.h"
 #include "tavik/base/trace.h"
-#include "tavik/iq/protos/tuning_tree.pb.h"
-#include "tavik/iq/protos/tuning_usecase.pb.h"
-#include "tavik/iq/read_binary_proto.h"
-#include "tavik/iq/tuning_provider_base.h"
+#include "tavik/iq/testing/translator_testing.h"
 #include "tavik/iq/zel/protos/blc_param.pb.h"
 #include "tavik/iq/zel/protos/gamma_param.pb.h"
-#include "tavik/iq/zel/protos/tuning_tree_set.pb.h"
+#include "tavik/iq/zel/translators/internal/gamma_curves.h"
 #include "tavik/iq/zel/zel_tuning_block.h"
 
 namespace tavik {
 namespace {
 
 using ::tavik::test::IsOk;
+using ::tavik::test::PatternFilled;
+using ::tavik::test::RecordingTraceSink;
+using ::tavik::test::SameBytes;
 using ::tavik::test::ScopedLogCapture;
 using ::tavik::test::StatusIs;
 using ::tavik_registers::zel::g3aa::GammaLutValue;
@@ -105,18 +102,6 @@ Tonemap IdentityCurveRules() {
 }
 
 template <typename Record>
-Record Filled(uint8_t byte = 0xA5) {
-  Record record;
-  std::memset(&record, byte, sizeof(record));
-  return record;
-}
-
-template <typename Record>
-bool SameBytes(const Record& a, const Record& b) {
-  return std::memcmp(&a, &b, sizeof(Record)) == 0;
-}
-
-template <typename Record>
 uint32_t Word(const Record& record, int index) {
   uint32_t word;
   std::memcpy(&word, reinterpret_cast<const char*>(&record) + 4 * index, 4);
@@ -181,22 +166,6 @@ std::vector<float> ExpectedG3aaKnots() {
   }
   return knots;
 }
-
-class RecordingTraceSink : public TraceSink {
- public:
-  void OnSpan(const TraceSpan& span) override {
-    std::lock_guard<std::mutex> lock(mutex_);
-    spans_.emplace_back(span.category, std::string(span.name));
-  }
-  std::vector<std::pair<int, std::string>> spans() const {
-    std::lock_guard<std::mutex> lock(mutex_);
-    return spans_;
-  }
-
- private:
-  mutable std::mutex mutex_;
-  std::vector<std::pair<int, std::string>> spans_;
-};
 
 // --- Records -------------------------------------------------------------------------------------
 
@@ -280,7 +249,7 @@ TEST(TonemapCurveTest, MoveAssignmentToItselfKeepsThePoints) {
 
 TEST(GammaDefaultTuningTest, IsAnEnabledPowerCurveOnKnotsOfOneSixtyFourth) {
   GammaTuning tuning;
-  gamma_internal::SetDefaultTuning(&tuning);
+  gamma_internal::SetDefaultTuning(tuning);
   EXPECT_TRUE(tuning.enable());
   ASSERT_EQ(tuning.static_param().gamma_x_size(), 65);
   for (int i = 0; i <= 64; ++i) {
@@ -306,7 +275,7 @@ TEST(GammaDefaultTuningTest, IsAnEnabledPowerCurveOnKnotsOfOneSixtyFourth) {
 
 TEST(GammaDefaultTuningTest, ReplacesWhatTheMessageHeld) {
   GammaTuning tuning = MakeTuning({0.5f}, {0.5f}, {0.5f}, {0.5f}, /*enable=*/false);
-  gamma_internal::SetDefaultTuning(&tuning);
+  gamma_internal::SetDefaultTuning(tuning);
   EXPECT_TRUE(tuning.enable());
   EXPECT_EQ(tuning.static_param().gamma_x_size(), 65);
   EXPECT_EQ(tuning.dynamic_param().gamma_r_size(), 65);
@@ -526,7 +495,7 @@ TEST(GammaResampleTonemapTest, EqualKnotsOnlyFailWhereASampleFallsBetweenThem) {
 // --- ITP translation -----------------------------------------------------------------------------
 
 TEST(TranslateGammaItpTest, IdentityCurveGivesTheKnotCodesAndALastStepOf252) {
-  auto output = Filled<GammaItpOutput>();
+  auto output = PatternFilled<GammaItpOutput>();
   TonemapCurve curve;
   const ZelTuningBlock<GammaTuning> unused_block;
   const Tonemap tonemap = IdentityCurveRules();
@@ -573,7 +542,7 @@ TEST(TranslateGammaItpTest, ApplicationCurveMayBeTheOutCurveItself) {
 }
 
 TEST(TranslateGammaItpTest, ApplicationCurveWithOnePointFailsAndLeavesTheOutputUntouched) {
-  auto output = Filled<GammaItpOutput>();
+  auto output = PatternFilled<GammaItpOutput>();
   const auto before = output;
   TonemapCurve curve;
   const Tonemap tonemap =
@@ -584,7 +553,7 @@ TEST(TranslateGammaItpTest, ApplicationCurveWithOnePointFailsAndLeavesTheOutputU
 }
 
 TEST(TranslateGammaItpTest, ApplicationCurveWithAFlatSegmentFailsWithItsIndices) {
-  auto output = Filled<GammaItpOutput>();
+  auto output = PatternFilled<GammaItpOutput>();
   const auto before = output;
   TonemapCurve curve;
   const Points identity = {{0.0f, 0.0f}, {1.0f, 1.0f}};
@@ -605,7 +574,7 @@ TEST(TranslateGammaItpTest, TuningGivesItsCodesAndHandsBackItsResampledCurve) {
     b.push_back(v * 0.5f);
   }
   const ZelTuningBlock<GammaTuning> block(MakeTuning(x, r, g, b));
-  auto output = Filled<GammaItpOutput>();
+  auto output = PatternFilled<GammaItpOutput>();
   TonemapCurve curve;
   curve.red = {{0.25f, 0.25f}};  // Replaced.
   TAVIK_ASSERT_OK(TranslateGamma(block, TuningRules(), output, curve));
@@ -652,7 +621,7 @@ TEST(TranslateGammaItpTest, EveryModeButZeroLetsTheTuningRule) {
 TEST(TranslateGammaItpTest, BlockOfAnotherTypeIsLoggedThenRefused) {
   ScopedLogCapture capture;
   const ZelTuningBlock<vosbrine::zelmondrake::BlcTuning> other_block;
-  auto output = Filled<GammaItpOutput>();
+  auto output = PatternFilled<GammaItpOutput>();
   const auto before = output;
   TonemapCurve curve;
   EXPECT_THAT(TranslateGamma(other_block, TuningRules(), output, curve),
@@ -670,7 +639,7 @@ TEST(TranslateGammaItpTest, MissingPartsAreRefusedRegionInfoFirst) {
   GammaTuning empty;
   empty.set_enable(true);
 
-  auto output = Filled<GammaItpOutput>();
+  auto output = PatternFilled<GammaItpOutput>();
   const auto before = output;
   TonemapCurve curve;
   EXPECT_THAT(TranslateGamma(ZelTuningBlock<GammaTuning>(no_dynamic), TuningRules(), output, curve),
@@ -686,7 +655,7 @@ TEST(TranslateGammaItpTest, AShortListGivesTheSizeOfTheKnots) {
   const std::vector<float> x = Knots64();
   std::vector<float> short_r = x;
   short_r.pop_back();
-  auto output = Filled<GammaItpOutput>();
+  auto output = PatternFilled<GammaItpOutput>();
   const auto before = output;
   TonemapCurve curve;
   EXPECT_THAT(TranslateGamma(ZelTuningBlock<GammaTuning>(MakeTuning(x, short_r, x, x)),
@@ -727,7 +696,7 @@ TEST(TranslateGammaItpTest, CodesAreMaskedToFifteenBitsBeforeTheLimit) {
   r[11] = -1.0f / 32768.0f;  // -1: 32767 once masked, limited.
   r[12] = 3.0f / 32768.0f;   // 1.5 codes: 2.
   r[13] = 1.0f / 65536.0f;   // A quarter code: 0.
-  auto output = Filled<GammaItpOutput>();
+  auto output = PatternFilled<GammaItpOutput>();
   TonemapCurve curve;
   TAVIK_ASSERT_OK(TranslateGamma(ZelTuningBlock<GammaTuning>(MakeTuning(x, r, x, x)), TuningRules(),
                                  output, curve));
@@ -748,7 +717,7 @@ TEST(TranslateGammaItpTest, FallingLastStepsSetTheSignBitsAndKeepTheirMagnitudes
   r[64] = 0.5f;   // 8192 - 16128: falls by 7936.
   g[64] = 2.0f;   // Masked to 0: falls by 16128.
   b[63] = -1.0f;  // -16384 masked: 16384, so the step 16384 -> 16384 is flat.
-  auto output = Filled<GammaItpOutput>();
+  auto output = PatternFilled<GammaItpOutput>();
   TonemapCurve curve;
   TAVIK_ASSERT_OK(TranslateGamma(ZelTuningBlock<GammaTuning>(MakeTuning(x, r, g, b)), TuningRules(),
                                  output, curve));
@@ -766,7 +735,7 @@ TEST(TranslateGammaItpTest, FallingLastKnotFailsWithTheTablesWritten) {
   x[64] = 2.0f;  // Codes as 0, below the 16128 of knot 63.
   std::vector<float> r = Knots64();
   r[64] = 0.0f;
-  auto output = Filled<GammaItpOutput>();
+  auto output = PatternFilled<GammaItpOutput>();
   TonemapCurve curve;
   EXPECT_THAT(TranslateGamma(ZelTuningBlock<GammaTuning>(MakeTuning(x, r, x, x, false)),
                              TuningRules(), output, curve),
@@ -784,7 +753,7 @@ TEST(TranslateGammaItpTest, FallingLastKnotFailsWithTheTablesWritten) {
 TEST(TranslateGammaItpTest, DisabledTuningSetsBypassAndStillWritesTheTables) {
   GammaTuning tuning = IdentityTuning();
   tuning.set_enable(false);
-  auto output = Filled<GammaItpOutput>();
+  auto output = PatternFilled<GammaItpOutput>();
   TonemapCurve curve;
   TAVIK_ASSERT_OK(
       TranslateGamma(ZelTuningBlock<GammaTuning>(tuning), TuningRules(), output, curve));
@@ -795,7 +764,7 @@ TEST(TranslateGammaItpTest, DisabledTuningSetsBypassAndStillWritesTheTables) {
 }
 
 TEST(TranslateGammaItpTest, BitsOutsideTheFieldsSurvive) {
-  auto output = Filled<GammaItpOutput>();
+  auto output = PatternFilled<GammaItpOutput>();
   TonemapCurve curve;
   TAVIK_ASSERT_OK(
       TranslateGamma(ZelTuningBlock<GammaTuning>(IdentityTuning()), TuningRules(), output, curve));
@@ -808,12 +777,10 @@ TEST(TranslateGammaItpTest, BitsOutsideTheFieldsSurvive) {
 
 TEST(TranslateGammaItpTest, OpensATraceNamedAfterItself) {
   RecordingTraceSink sink;
-  SetTraceSink(&sink);
   GammaItpOutput output{};
   TonemapCurve curve;
   const Status status =
       TranslateGamma(ZelTuningBlock<GammaTuning>(IdentityTuning()), TuningRules(), output, curve);
-  SetTraceSink(nullptr);
   TAVIK_EXPECT_OK(status);
   EXPECT_THAT(sink.spans(), ElementsAre(std::pair<int, std::string>(5, "TranslateGamma")));
 }
@@ -824,8 +791,8 @@ TEST(TranslateGammaG3aaTest, WritesTheGreenCurveAtTheStageKnots) {
   const std::vector<float> x = Knots64();
   std::vector<float> r(65, 0.0f), g, b(65, 1.0f);
   for (float v : x) g.push_back(std::sqrt(v));
-  auto config = Filled<GammaConfigValue>();
-  auto lut = Filled<GammaLutValue>();
+  auto config = PatternFilled<GammaConfigValue>();
+  auto lut = PatternFilled<GammaLutValue>();
   TAVIK_ASSERT_OK(TranslateGamma(ZelTuningBlock<GammaTuning>(MakeTuning(x, r, g, b)), TuningRules(),
                                  config, lut));
   EXPECT_EQ(config.enable, 1u);
@@ -859,8 +826,8 @@ TEST(TranslateGammaG3aaTest, DisabledBlockWritesTheEnableByteAndKeepsTheOldTable
   tuning.set_enable(false);
   for (float v : Knots64()) tuning.mutable_static_param()->add_gamma_x(v);
   tuning.mutable_dynamic_param();
-  auto config = Filled<GammaConfigValue>();
-  auto lut = Filled<GammaLutValue>();
+  auto config = PatternFilled<GammaConfigValue>();
+  auto lut = PatternFilled<GammaLutValue>();
   const auto old_lut = lut;
   TAVIK_ASSERT_OK(TranslateGamma(ZelTuningBlock<GammaTuning>(tuning), TuningRules(), config, lut));
   EXPECT_EQ(config.enable, 0u);
@@ -872,8 +839,8 @@ TEST(TranslateGammaG3aaTest, ApplicationCurveEnablesTheStage) {
   const Points identity = {{0.0f, 0.0f}, {1.0f, 1.0f}};
   const Points half = {{0.0f, 0.0f}, {1.0f, 0.5f}};
   const ZelTuningBlock<vosbrine::zelmondrake::BlcTuning> unused_block;
-  auto config = Filled<GammaConfigValue>();
-  auto lut = Filled<GammaLutValue>();
+  auto config = PatternFilled<GammaConfigValue>();
+  auto lut = PatternFilled<GammaLutValue>();
   TAVIK_ASSERT_OK(TranslateGamma(unused_block, CurveRules(identity, half, identity), config, lut));
   EXPECT_EQ(config.enable, 1u);
   // The stage reads the tuning sampled at i/65, beyond 64/65 extrapolated.
@@ -894,8 +861,8 @@ TEST(TranslateGammaG3aaTest, ApplicationCurveEnablesTheStage) {
 
 TEST(TranslateGammaG3aaTest, FailuresOfTheTuningAndTheCurveLeaveTheRecordsUntouched) {
   ScopedLogCapture capture;
-  auto config = Filled<GammaConfigValue>();
-  auto lut = Filled<GammaLutValue>();
+  auto config = PatternFilled<GammaConfigValue>();
+  auto lut = PatternFilled<GammaLutValue>();
   const auto old_config = config;
   const auto old_lut = lut;
   GammaTuning no_dynamic = IdentityTuning();
@@ -935,7 +902,7 @@ TEST(TranslateGammaG3aaTest, AGreenCurveShorterThanTheKnotsIsRefused) {
   std::vector<float> short_g = Knots64();
   short_g.pop_back();
   GammaConfigValue config{};
-  auto lut = Filled<GammaLutValue>();
+  auto lut = PatternFilled<GammaLutValue>();
   EXPECT_THAT(TranslateGamma(ZelTuningBlock<GammaTuning>(MakeTuning(Knots64(), {}, short_g, {})),
                              TuningRules(), config, lut),
               StatusIs(kInvalid, "Gamma size is wrong: 65"));
@@ -946,7 +913,7 @@ TEST(TranslateGammaG3aaTest, FlatBracketFailsAfterTheTableIsCleared) {
   std::vector<float> x = Knots64();
   x[1] = 0.0f;
   GammaConfigValue config{};
-  auto lut = Filled<GammaLutValue>();
+  auto lut = PatternFilled<GammaLutValue>();
   EXPECT_THAT(TranslateGamma(ZelTuningBlock<GammaTuning>(MakeTuning(x, x, x, x)), TuningRules(),
                              config, lut),
               StatusIs(kInvalid, "gamma_x[1] must be larger than [0] in tuning data. 0 0"));
@@ -957,8 +924,8 @@ TEST(TranslateGammaG3aaTest, FlatBracketFailsAfterTheTableIsCleared) {
 // --- Defaults ------------------------------------------------------------------------------------
 
 TEST(GetDefaultGammaItpTest, GivesThePowerCurveWithoutBypass) {
-  auto output = Filled<GammaItpOutput>();
-  auto fixed = Filled<GammaItpFixedOutput>();
+  auto output = PatternFilled<GammaItpOutput>();
+  auto fixed = PatternFilled<GammaItpFixedOutput>();
   TAVIK_ASSERT_OK(GetDefaultGamma(output, fixed));
   EXPECT_EQ(output.bypass, 0u);
   EXPECT_EQ(output.gamma_r_last_negative, 0u);
@@ -981,7 +948,7 @@ TEST(GetDefaultGammaItpTest, GivesThePowerCurveWithoutBypass) {
 
 TEST(GetDefaultGammaItpTest, ClearsTheFixedFieldsAndKeepsTheirNeighbours) {
   GammaItpOutput output{};
-  auto fixed = Filled<GammaItpFixedOutput>();
+  auto fixed = PatternFilled<GammaItpFixedOutput>();
   TAVIK_ASSERT_OK(GetDefaultGamma(output, fixed));
   EXPECT_EQ(fixed.flag, 0u);
   EXPECT_EQ(fixed.value_0, 0u);
@@ -993,19 +960,17 @@ TEST(GetDefaultGammaItpTest, ClearsTheFixedFieldsAndKeepsTheirNeighbours) {
 
 TEST(GetDefaultGammaItpTest, OpensItsOwnTraceAroundTheTranslation) {
   RecordingTraceSink sink;
-  SetTraceSink(&sink);
   GammaItpOutput output{};
   GammaItpFixedOutput fixed{};
   const Status status = GetDefaultGamma(output, fixed);
-  SetTraceSink(nullptr);
   TAVIK_EXPECT_OK(status);
   EXPECT_THAT(sink.spans(), ElementsAre(std::pair<int, std::string>(5, "TranslateGamma"),
                                         std::pair<int, std::string>(5, "GetDefaultGamma")));
 }
 
 TEST(GetDefaultGammaG3aaTest, EnablesTheStageAndLimitsTheTopSlot) {
-  auto config = Filled<GammaConfigValue>();
-  auto lut = Filled<GammaLutValue>();
+  auto config = PatternFilled<GammaConfigValue>();
+  auto lut = PatternFilled<GammaLutValue>();
   TAVIK_ASSERT_OK(GetDefaultGamma(config, lut));
   EXPECT_EQ(config.enable, 1u);
   EXPECT_EQ(lut.gamma_lut_values[0], 0);
@@ -1021,49 +986,19 @@ TEST(GetDefaultGammaG3aaTest, EnablesTheStageAndLimitsTheTopSlot) {
 
 // --- The sample tuning set -----------------------------------------------------------------------
 
-TEST(GammaSampleTuningTest, EveryLeafOfEverySampleFileTranslates) {
-  namespace fs = std::filesystem;
-  const fs::path dir(TAVIK_SAMPLE_TUNING_DIR);
-  if (!fs::is_directory(dir)) GTEST_SKIP() << "The sample tuning set is not built: " << dir;
-  int files = 0;
-  int leaves = 0;
-  for (const fs::directory_entry& entry : fs::directory_iterator(dir)) {
-    const std::string path = entry.path().string();
-    // Golden module calibrations lie beside the tunings and hold no trees.
-    if (entry.path().extension() != ".binarypb" ||
-        path.find("golden_sensor_factory_calibration_data") != std::string::npos) {
-      continue;
-    }
-    vosbrine::TuningUsecaseData data;
-    TAVIK_ASSERT_OK(ReadBinaryProto(path, data));
-    vosbrine::zelmondrake::TuningTreeSet tree_set;
-    ASSERT_TRUE(data.tuning_tree_set().UnpackTo(&tree_set)) << path;
-    if (!tree_set.has_gamma()) continue;
-    ++files;
-    vosbrine::TuningTree tree = tree_set.gamma();
-    std::vector<google::protobuf::Any*> dynamic_params;
-    TAVIK_ASSERT_OK(vosbrine::TuningProviderBase::FindMutableDynamicParams(
-        tree.mutable_dynamic_top_level(), &dynamic_params));
-    for (const google::protobuf::Any* dynamic_param : dynamic_params) {
-      GammaTuning tuning;
-      tuning.set_enable(tree.enable());
-      ASSERT_TRUE(tree.static_param().UnpackTo(tuning.mutable_static_param())) << path;
-      ASSERT_TRUE(dynamic_param->UnpackTo(tuning.mutable_dynamic_param())) << path;
-      const ZelTuningBlock<GammaTuning> block(tuning);
-      GammaItpOutput output{};
-      TonemapCurve curve;
-      EXPECT_THAT(TranslateGamma(block, TuningRules(), output, curve), IsOk())
-          << path << " leaf " << leaves;
-      EXPECT_EQ(curve.green.size(), 64u);
-      GammaConfigValue config{};
-      GammaLutValue lut{};
-      EXPECT_THAT(TranslateGamma(block, TuningRules(), config, lut), IsOk())
-          << path << " leaf " << leaves;
-      ++leaves;
-    }
-  }
-  EXPECT_GT(files, 0);
-  EXPECT_GT(leaves, files);
+// The curve handed back for every leaf is the tuning's, resampled at 64 points.
+TEST(GammaSampleTuningTest, EveryLeafHandsBackA64PointCurve) {
+  const int leaves = test::ForEachSampleLeaf<GammaTuning>(
+      [](const ZelTuningBlock<GammaTuning>& block, const std::string&) {
+        GammaItpOutput output{};
+        TonemapCurve curve;
+        EXPECT_THAT(TranslateGamma(block, TuningRules(), output, curve), IsOk());
+        EXPECT_EQ(curve.red.size(), 64u);
+        EXPECT_EQ(curve.green.size(), 64u);
+        EXPECT_EQ(curve.blue.size(), 64u);
+      });
+  if (::testing::Test::IsSkipped()) return;
+  EXPECT_GT(leaves, 0);
 }
 
 }  // namespace

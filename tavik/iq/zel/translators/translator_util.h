@@ -1,22 +1,33 @@
-// What every online translator shares: the stock failure texts, the checks of a tuning message,
-// the one fixed-point rounding, bit masking, and the colour-table word packing.
+// The frame every online translator shares: the stock failure texts and one-line checks, the shape
+// of every GetDefault<Block>, the one fixed-point rounding, bit masking, the knot search of curves
+// and lookup tables, and the colour-table word packing.
 //
 // A translator is a free function in namespace tavik:
 //   Status Translate<Block>(const TuningBlock& block, const <Block>Input& input,
 //                           <Block>Output& output);
 // It opens PerfTrace(kTranslatorTraceCategory, "<its name>"), reads its message with
-// GetTuningProto<T>(block), checks it (CheckTuning below, or the unit's own order), writes the
-// bypass or enable bit, then converts each field with ToFixedPoint (or the documented exception)
-// into the record's bit fields. Records are written field by field, so bits the caller set
-// elsewhere survive. The normal path allocates nothing; texts are built only on failure.
+// RequireTuning<T>(block), checks it (RequireDynamic, RequireStatic, RequireSize, each taking the
+// unit's own text where it has one, in the unit's own order), writes the bypass or enable bit,
+// then converts each field with ToFixedPoint (or the documented exception) and stores it with
+// TAVIK_SET_FIELD, which masks to the field's own width. Records are written field by field, so
+// bits the caller set elsewhere survive. The normal path allocates nothing; texts are built only
+// on failure.
 #ifndef TAVIK_IQ_ZEL_TRANSLATORS_TRANSLATOR_UTIL_H_
 #define TAVIK_IQ_ZEL_TRANSLATORS_TRANSLATOR_UTIL_H_
 
+#include <algorithm>
 #include <cmath>
 #include <cstdint>
+#include <span>
+#include <string_view>
 
 #include "tavik/base/status.h"
+#include "tavik/base/strings.h"
+#include "tavik/base/trace.h"
+#include "tavik/base/tuning_block.h"
 #include "tavik/iq/export.h"
+#include "tavik/iq/zel/translators/record_description.h"
+#include "tavik/iq/zel/zel_tuning_block.h"
 
 namespace tavik {
 
@@ -25,13 +36,90 @@ inline constexpr char kInvalidTuningBlockText[] = "Invalid TuningBlock!";
 inline constexpr char kNoRegionInfoText[] = "Tuning data doesn't have region info.";
 inline constexpr char kNoStaticInfoText[] = "Tuning data doesn't have static info.";
 
+// Checks of a translator's arguments, one line each: they return OK or the failure with the
+// unit's text, so that a unit keeps its own order of checks without if/return blocks.
+
+// The block's message, or "Invalid TuningBlock!" (after GetTuningProto's line naming the types).
+template <typename T>
+StatusOr<const T*> RequireTuning(const TuningBlock& block,
+                                 const char* text = kInvalidTuningBlockText) {
+  const T* tuning = GetTuningProto<T>(block);
+  if (tuning == nullptr) return InvalidArgumentError(text);
+  return tuning;
+}
+
+// The message's dynamic part ("region info").
+template <typename T>
+Status RequireDynamic(const T& tuning, const char* text = kNoRegionInfoText) {
+  if (!tuning.has_dynamic_param()) return InvalidArgumentError(text);
+  return OkStatus();
+}
+
+// The message's static part.
+template <typename T>
+Status RequireStatic(const T& tuning, const char* text = kNoStaticInfoText) {
+  if (!tuning.has_static_param()) return InvalidArgumentError(text);
+  return OkStatus();
+}
+
+// A register record handed over by pointer.
+template <typename Record>
+Status RequireOutput(const Record* output) {
+  if (output == nullptr) return InvalidArgumentError(kOutputIsNullText);
+  return OkStatus();
+}
+
+// A failure text that ends with the count found: CountAfter("Noise gain lut size is wrong: ").
+struct CountAfter {
+  const char* prefix;
+};
+
+// A list of exactly `expected` entries (a repeated field, or anything with size()).
+template <typename List>
+Status RequireSize(const List& list, int expected, const char* text) {
+  if (static_cast<int>(list.size()) != expected) return InvalidArgumentError(text);
+  return OkStatus();
+}
+template <typename List>
+Status RequireSize(const List& list, int expected, CountAfter text) {
+  if (static_cast<int>(list.size()) != expected) {
+    return InvalidArgumentError(StrCat(text.prefix, list.size()));
+  }
+  return OkStatus();
+}
+
 // The usual checks of a tuning message, in the usual order: a message at all ("Invalid
 // TuningBlock!"), its dynamic part ("... region info."), its static part ("... static info.").
 template <typename T>
 Status CheckTuning(const T* tuning) {
   if (tuning == nullptr) return InvalidArgumentError(kInvalidTuningBlockText);
-  if (!tuning->has_dynamic_param()) return InvalidArgumentError(kNoRegionInfoText);
-  if (!tuning->has_static_param()) return InvalidArgumentError(kNoStaticInfoText);
+  if (Status status = RequireDynamic(*tuning); !status.ok()) return status;
+  return RequireStatic(*tuning);
+}
+
+// The shape of every GetDefault<Block>: opens its trace, fills a block on the stack with the
+// unit's default tuning, runs the unit's own translation of it (so that default values follow
+// from the same formulas), and only on success writes the fixed record's constants.
+//
+//   Status GetDefaultFoo(FooOutput& output, FooFixedOutput& fixed) {
+//     return GetDefault("GetDefaultFoo", SetDefaultTuning,
+//                       [&](const TuningBlock& block) {
+//                         return TranslateFoo(block, kDefaultInput, output);
+//                       },
+//                       [&] { WriteFixedOutput(fixed); });
+//   }
+struct NoFixedOutput {
+  void operator()() const {}
+};
+template <typename Tuning, typename Translate, typename WriteFixed = NoFixedOutput>
+Status GetDefault(std::string_view trace_name, void (*set_default_tuning)(Tuning&),
+                  Translate&& translate, WriteFixed&& write_fixed = {}) {
+  PerfTrace trace(kTranslatorTraceCategory, trace_name);
+  ZelTuningBlock<Tuning> block;
+  set_default_tuning(block.message);
+  Status status = translate(static_cast<const TuningBlock&>(block));
+  if (!status.ok()) return status;
+  write_fixed();
   return OkStatus();
 }
 
@@ -55,6 +143,47 @@ TAVIK_EXPORT int64_t TruncateWrapping(double value);
 // `value` truncated toward zero and limited to [0, 2^32 - 1], NaN giving 0: the saturating
 // float-to-unsigned conversion of the device's CPU, for fields truncated to an unsigned integer.
 TAVIK_EXPORT uint32_t TruncateToUint32(double value);
+
+// Where a sample falls in a rising knot table: between knots `upper` - 1 and `upper`, with the
+// weight of the lower knot (below 0 or above 1 beyond the table's ends). `rises` is false when
+// those two knots do not rise, which the caller reports in its own words.
+struct KnotBracket {
+  int upper = 1;
+  float weight_of_lower = 0.0f;
+  bool rises = true;
+};
+
+// Brackets a run of rising samples in a knot table of at least two knots, searching forward from
+// where the previous sample was found: the upper knot is the first knot not below the sample (a
+// binary lower bound), or the first or last bracket for samples beyond the ends. Curves, tone maps
+// and lookup tables are all sampled this way.
+class KnotCursor {
+ public:
+  explicit KnotCursor(std::span<const float> knots) : knots_(knots) {}
+
+  KnotBracket Find(float sample) {
+    const auto found = std::lower_bound(knots_.begin() + start_, knots_.end(), sample);
+    start_ = static_cast<size_t>(found - knots_.begin());
+    const size_t upper = start_ == 0 ? 1 : start_ == knots_.size() ? knots_.size() - 1 : start_;
+    const float x1 = knots_[upper];
+    const float x0 = knots_[upper - 1];
+    KnotBracket bracket;
+    bracket.upper = static_cast<int>(upper);
+    bracket.rises = x1 > x0;
+    if (bracket.rises) bracket.weight_of_lower = (x1 - sample) / (x1 - x0);
+    return bracket;
+  }
+
+ private:
+  std::span<const float> knots_;
+  size_t start_ = 0;
+};
+
+// The value between two knots' values, by the weight of the lower one:
+// weight * lower + (1 - weight) * upper, in single precision in that order.
+inline float InterpolateKnots(float weight_of_lower, float lower, float upper) {
+  return weight_of_lower * lower + (1.0f - weight_of_lower) * upper;
+}
 
 // One colour-table entry of three components of nominally 10 bits, at most one of them wider:
 // the layout is chosen by which one overflows and announced in the top bits. `a` stands high,
