@@ -15,7 +15,7 @@ install(TARGETS tavik_base tavik_iq_zel tavik_iq_zel_static
 
 install(DIRECTORY ${PROJECT_SOURCE_DIR}/tavik/ DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/tavik
   FILES_MATCHING PATTERN "*.h" PATTERN "*.proto"
-  PATTERN "testing" EXCLUDE)
+  PATTERN "testing" EXCLUDE PATTERN "internal" EXCLUDE)
 install(DIRECTORY ${TAVIK_GENERATED_DIR}/tavik/ DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/tavik
   FILES_MATCHING PATTERN "*.pb.h")
 

@@ -14,6 +14,7 @@
 #include "tavik/base/testing/log_capture.h"
 #include "tavik/base/testing/status_matchers.h"
 #include "tavik/base/trace.h"
+#include "tavik/iq/testing/blc_tunings.h"
 #include "tavik/iq/testing/translator_testing.h"
 #include "tavik/iq/zel/translators/dg_online_translator.h"
 #include "tavik/iq/zel/translators/translator_util.h"
@@ -34,38 +35,19 @@ using ::testing::HasSubstr;
 using ::testing::IsEmpty;
 
 namespace zm = ::vosbrine::zelmondrake;
+using ::tavik::test::BlcBlock;
 using ::tavik::test::ForeignBlock;
+using ::tavik::test::MakeBlcTuning;
 using ::tavik::test::PatternFilled;
 using ::tavik::test::RecordingTraceSink;
 using ::tavik::test::SameBytes;
+using ::tavik::test::UniformBlcTuning;
 
 constexpr absl::StatusCode kInvalid = absl::StatusCode::kInvalidArgument;
 
-zm::BlcTuning MakeTuning(std::vector<float> r, std::vector<float> gr, std::vector<float> gb,
-                         std::vector<float> b, bool enable = true) {
-  zm::BlcTuning tuning;
-  tuning.set_enable(enable);
-  tuning.mutable_static_param();
-  zm::BlcDynamicParam& dynamic = *tuning.mutable_dynamic_param();
-  for (float value : r) dynamic.add_offsets_r(value);
-  for (float value : gr) dynamic.add_offsets_gr(value);
-  for (float value : gb) dynamic.add_offsets_gb(value);
-  for (float value : b) dynamic.add_offsets_b(value);
-  return tuning;
-}
-
-zm::BlcTuning UniformTuning(float offset, bool enable = true) {
-  const std::vector<float> four(4, offset);
-  return MakeTuning(four, four, four, four, enable);
-}
-
 // r = 1..4, gr = 5..8, gb = 9..12, b = 13..16: every element of every colour is told apart.
 zm::BlcTuning NumberedTuning() {
-  return MakeTuning({1, 2, 3, 4}, {5, 6, 7, 8}, {9, 10, 11, 12}, {13, 14, 15, 16});
-}
-
-ZelTuningBlock<zm::BlcTuning> Block(zm::BlcTuning tuning) {
-  return ZelTuningBlock<zm::BlcTuning>(std::move(tuning));
+  return MakeBlcTuning({1, 2, 3, 4}, {5, 6, 7, 8}, {9, 10, 11, 12}, {13, 14, 15, 16});
 }
 
 template <typename Word, typename Record>
@@ -257,23 +239,23 @@ TEST(TranslateBlcIppTest, BlockOfAnotherTypeIsInvalidAfterTheTypeLogLine) {
 }
 
 TEST(TranslateBlcIppTest, MissingDynamicParamIsRegionInfoFailureBeforeAnyWrite) {
-  zm::BlcTuning tuning = UniformTuning(64);
+  zm::BlcTuning tuning = UniformBlcTuning(64);
   tuning.clear_dynamic_param();
   tuning.clear_static_param();
   BlcIppOutput output = PatternFilled<BlcIppOutput>();
   const BlcIppOutput before = output;
-  EXPECT_THAT(TranslateBlc(Block(tuning),
+  EXPECT_THAT(TranslateBlc(BlcBlock(tuning),
                            IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 1.0f), output),
               StatusIs(kInvalid, "Tuning data doesn't have region info."));
   EXPECT_TRUE(SameBytes(output, before));
 }
 
 TEST(TranslateBlcIppTest, MissingStaticParamIsStaticInfoFailure) {
-  zm::BlcTuning tuning = UniformTuning(64);
+  zm::BlcTuning tuning = UniformBlcTuning(64);
   tuning.clear_static_param();
   BlcIppOutput output = PatternFilled<BlcIppOutput>();
   const BlcIppOutput before = output;
-  EXPECT_THAT(TranslateBlc(Block(tuning),
+  EXPECT_THAT(TranslateBlc(BlcBlock(tuning),
                            IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 1.0f), output),
               StatusIs(kInvalid, "Tuning data doesn't have static info."));
   EXPECT_TRUE(SameBytes(output, before));
@@ -284,7 +266,7 @@ TEST(TranslateBlcIppTest, DepthOutsideOneToSixteenIsRefused) {
     BlcIppOutput output = PatternFilled<BlcIppOutput>();
     const BlcIppOutput before = output;
     EXPECT_THAT(
-        TranslateBlc(Block(UniformTuning(64)),
+        TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                      IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, depth, 1.0f), output),
         StatusIs(kInvalid,
                  "Sensor bit depth doesn't match with hardware pipeline " + std::to_string(depth)));
@@ -294,7 +276,7 @@ TEST(TranslateBlcIppTest, DepthOutsideOneToSixteenIsRefused) {
 
 TEST(TranslateBlcIppTest, WrongArraySizeIsRefusedWithTheParamTextAfterBypassAndTileMode) {
   BlcIppOutput output = PatternFilled<BlcIppOutput>();
-  EXPECT_THAT(TranslateBlc(Block(MakeTuning({64}, {}, {}, {}, /*enable=*/false)),
+  EXPECT_THAT(TranslateBlc(BlcBlock(MakeBlcTuning({64}, {}, {}, {}, /*enable=*/false)),
                            IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_MONO, 10, 1.0f), output),
               StatusIs(kInvalid, "Offsets size is wrong: offsets_r: 64\n"));
   EXPECT_EQ(output.bypass, 1u);
@@ -306,16 +288,16 @@ TEST(TranslateBlcIppTest, WrongArraySizeIsRefusedWithTheParamTextAfterBypassAndT
 
 TEST(TranslateBlcIppTest, FiveValuesInOneArrayAreAlsoRefused) {
   BlcIppOutput output = {};
-  const Status status =
-      TranslateBlc(Block(MakeTuning({1, 2, 3, 4}, {1, 2, 3, 4}, {1, 2, 3, 4, 5}, {1, 2, 3, 4})),
-                   IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 1.0f), output);
+  const Status status = TranslateBlc(
+      BlcBlock(MakeBlcTuning({1, 2, 3, 4}, {1, 2, 3, 4}, {1, 2, 3, 4, 5}, {1, 2, 3, 4})),
+      IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 1.0f), output);
   EXPECT_THAT(status, StatusIs(kInvalid, HasSubstr("Offsets size is wrong: offsets_r: 1\n")));
   EXPECT_THAT(status, StatusIs(kInvalid, HasSubstr("offsets_gb: 5\noffsets_b: 1\n")));
 }
 
 TEST(TranslateBlcIppTest, DigitalGainBelowOneIsRefusedAfterTheOffsetsAreWritten) {
   BlcIppOutput output = PatternFilled<BlcIppOutput>();
-  EXPECT_THAT(TranslateBlc(Block(UniformTuning(64)),
+  EXPECT_THAT(TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                            IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 0.5f), output),
               StatusIs(kInvalid, "digital_gain should be higher than 1.0f 0.5"));
   EXPECT_THAT(Offsets(output), Each(31744));
@@ -326,19 +308,19 @@ TEST(TranslateBlcIppTest, DigitalGainBelowOneIsRefusedAfterTheOffsetsAreWritten)
 TEST(TranslateBlcIppTest, DigitalGainFailureShowsSixSignificantDigits) {
   BlcIppOutput output = {};
   EXPECT_THAT(
-      TranslateBlc(Block(UniformTuning(64)),
+      TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                    IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 0.1234567f), output),
       StatusIs(kInvalid, "digital_gain should be higher than 1.0f 0.123457"));
 }
 
 TEST(TranslateBlcIppTest, EnableClearsBypassAndMonoSetsTileModeBitZero) {
   BlcIppOutput output = PatternFilled<BlcIppOutput>();
-  TAVIK_ASSERT_OK(TranslateBlc(Block(UniformTuning(64)),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_MONO, 10, 1.0f),
                                output));
   EXPECT_EQ(output.bypass, 0u);
   EXPECT_EQ(output.tile_mode, 7u);
-  TAVIK_ASSERT_OK(TranslateBlc(Block(UniformTuning(64, /*enable=*/false)),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(UniformBlcTuning(64, /*enable=*/false)),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_QUAD_BAYER, 10, 1.0f),
                                output));
   EXPECT_EQ(output.bypass, 1u);
@@ -365,7 +347,7 @@ TEST(TranslateBlcIppTest, BayerTilePlacesElementKInTheKthQuadForEachPattern) {
     for (vosbrine::SensorType type : {vosbrine::SENSOR_TYPE_BAYER, vosbrine::SENSOR_TYPE_MONO}) {
       BlcIppOutput output = PatternFilled<BlcIppOutput>();
       TAVIK_ASSERT_OK(
-          TranslateBlc(Block(NumberedTuning()), IppInput(c.pattern, type, 14, 1.0f), output));
+          TranslateBlc(BlcBlock(NumberedTuning()), IppInput(c.pattern, type, 14, 1.0f), output));
       EXPECT_THAT(Offsets(output), ElementsAreArray(RawAtDepth14(c.tile)));
     }
   }
@@ -373,13 +355,13 @@ TEST(TranslateBlcIppTest, BayerTilePlacesElementKInTheKthQuadForEachPattern) {
 
 TEST(TranslateBlcIppTest, QuadBayerTileGivesEachColourOneTwoByTwoBlock) {
   BlcIppOutput output = {};
-  TAVIK_ASSERT_OK(TranslateBlc(Block(NumberedTuning()),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(NumberedTuning()),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_QUAD_BAYER, 14, 1.0f),
                                output));
   EXPECT_THAT(
       Offsets(output),
       ElementsAreArray(RawAtDepth14({1, 2, 5, 6, 3, 4, 7, 8, 9, 10, 13, 14, 11, 12, 15, 16})));
-  TAVIK_ASSERT_OK(TranslateBlc(Block(NumberedTuning()),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(NumberedTuning()),
                                IppInput(vosbrine::GBRG, vosbrine::SENSOR_TYPE_QUAD_BAYER, 14, 1.0f),
                                output));
   EXPECT_THAT(
@@ -391,7 +373,7 @@ TEST(TranslateBlcIppTest, UnknownPatternIsLoggedAndReadAsRggb) {
   ScopedLogCapture log;
   BlcIppOutput output = {};
   TAVIK_ASSERT_OK(TranslateBlc(
-      Block(NumberedTuning()),
+      BlcBlock(NumberedTuning()),
       IppInput(static_cast<vosbrine::BayerPattern>(7), vosbrine::SENSOR_TYPE_BAYER, 14, 1.0f),
       output));
   EXPECT_THAT(
@@ -421,7 +403,7 @@ TEST(TranslateBlcIppTest, OffsetsScaleToFourteenBitsAndRoundHalfAwayFromZero) {
     SCOPED_TRACE(testing::Message() << "depth " << c.depth << " offset " << c.offset);
     BlcIppOutput output = {};
     TAVIK_ASSERT_OK(
-        TranslateBlc(Block(UniformTuning(c.offset)),
+        TranslateBlc(BlcBlock(UniformBlcTuning(c.offset)),
                      IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, c.depth, 1.0f), output));
     EXPECT_THAT(Offsets(output), Each(c.raw));
   }
@@ -429,7 +411,7 @@ TEST(TranslateBlcIppTest, OffsetsScaleToFourteenBitsAndRoundHalfAwayFromZero) {
 
 TEST(TranslateBlcIppTest, NanOffsetGivesAZeroEntry) {
   BlcIppOutput output = PatternFilled<BlcIppOutput>();
-  TAVIK_ASSERT_OK(TranslateBlc(Block(UniformTuning(std::numeric_limits<float>::quiet_NaN())),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(UniformBlcTuning(std::numeric_limits<float>::quiet_NaN())),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 14, 1.0f),
                                output));
   EXPECT_THAT(Offsets(output), Each(0));
@@ -439,16 +421,16 @@ TEST(TranslateBlcIppTest, NanOffsetGivesAZeroEntry) {
 TEST(TranslateBlcIppTest, DepthsFifteenAndSixteenUseTheWrappedShiftScale) {
   const float tiny = std::ldexp(1.0f, -21);
   BlcIppOutput output = {};
-  TAVIK_ASSERT_OK(TranslateBlc(Block(UniformTuning(tiny)),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(UniformBlcTuning(tiny)),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 15, 1.0f),
                                output));
   EXPECT_THAT(Offsets(output), Each(31744));  // 2^-21 x 2^31 = 1024.
-  TAVIK_ASSERT_OK(TranslateBlc(Block(UniformTuning(tiny)),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(UniformBlcTuning(tiny)),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 16, 1.0f),
                                output));
   EXPECT_THAT(Offsets(output), Each(32256));  // 2^-21 x 2^30 = 512.
   // An ordinary pedestal is a multiple of 2^15 there: every entry is 0.
-  TAVIK_ASSERT_OK(TranslateBlc(Block(UniformTuning(64)),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 16, 1.0f),
                                output));
   EXPECT_THAT(Offsets(output), Each(0));
@@ -458,18 +440,18 @@ TEST(TranslateBlcIppTest, DepthsFifteenAndSixteenUseTheWrappedShiftScale) {
 TEST(TranslateBlcIppTest, StretchTimesGainFromSixteenUpSelectsFiveIntegerBits) {
   BlcIppOutput output = {};
   // max_stretch 16383 / 15359 = 1.066671; x 20 = 21.33.
-  TAVIK_ASSERT_OK(TranslateBlc(Block(UniformTuning(64)),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 20.0f),
                                output));
   EXPECT_EQ(output.gain_integer_bits, 5u);
   EXPECT_THAT(Gains(output), Each(10922));  // 1.066671 x 20 x 512 = 10922.71.
   // 14.99 x 1.066671 = 15.99: four integer bits.
-  TAVIK_ASSERT_OK(TranslateBlc(Block(UniformTuning(64)),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 14.99f),
                                output));
   EXPECT_EQ(output.gain_integer_bits, 4u);
   // 15 x 1.066671 = 16.0001: five.
-  TAVIK_ASSERT_OK(TranslateBlc(Block(UniformTuning(64)),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 15.0f),
                                output));
   EXPECT_EQ(output.gain_integer_bits, 5u);
@@ -483,7 +465,7 @@ TEST(TranslateBlcIppTest, ProductOfThirtyTwoOrMoreCapsTheGainAndKeepsThePriorFor
   log.Clear();
   // 31 x 1.066671 = 33.07: the gain becomes 32 / 1.066671 = 29.99988, and the format stays the
   // 4 integer bits that GetDefaultBlc left. 32 x 1024 = 32768 wraps to 0 in 15 bits.
-  TAVIK_ASSERT_OK(TranslateBlc(Block(UniformTuning(64)),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 31.0f),
                                output));
   EXPECT_EQ(output.gain_integer_bits, 4u);
@@ -493,7 +475,7 @@ TEST(TranslateBlcIppTest, ProductOfThirtyTwoOrMoreCapsTheGainAndKeepsThePriorFor
   // A caller that left five integer bits gets 32 x 512.
   log.Clear();
   output.gain_integer_bits = 5;
-  TAVIK_ASSERT_OK(TranslateBlc(Block(UniformTuning(64)),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 31.0f),
                                output));
   EXPECT_EQ(output.gain_integer_bits, 5u);
@@ -505,7 +487,7 @@ TEST(TranslateBlcIppTest, NanDigitalGainPassesTheCheckAndIsCapped) {
   ScopedLogCapture log;
   BlcIppOutput output = {};
   output.gain_integer_bits = 5;
-  TAVIK_ASSERT_OK(TranslateBlc(Block(UniformTuning(64)),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10,
                                         std::numeric_limits<float>::quiet_NaN()),
                                output));
@@ -521,9 +503,10 @@ TEST(TranslateBlcIppTest, ZeroOffsetKeepsFourIntegerBitsAndItsEntryGainIsTheDigi
   BlcIppOutput output = {};
   output.gain_integer_bits = 7;
   // Element 0 of offsets_r lands at tile entry 0 in RGGB.
-  TAVIK_ASSERT_OK(TranslateBlc(
-      Block(MakeTuning({0, 64, 64, 64}, {64, 64, 64, 64}, {64, 64, 64, 64}, {64, 64, 64, 64})),
-      IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 20.0f), output));
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(MakeBlcTuning({0, 64, 64, 64}, {64, 64, 64, 64},
+                                                      {64, 64, 64, 64}, {64, 64, 64, 64})),
+                               IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 20.0f),
+                               output));
   EXPECT_EQ(output.gain_integer_bits, 4u);
   EXPECT_EQ(output.offsets[0], 0u);
   EXPECT_EQ(output.gains[0], 20480u);                                    // 20 x 1024.
@@ -534,9 +517,10 @@ TEST(TranslateBlcIppTest, ZeroOffsetKeepsFourIntegerBitsAndItsEntryGainIsTheDigi
 TEST(TranslateBlcIppTest, GainsWrapToFifteenBits) {
   BlcIppOutput output = {};
   // 40 x 1024 = 40960 and 1.066671 x 40 x 1024 = 43690.8, both past 15 bits.
-  TAVIK_ASSERT_OK(TranslateBlc(
-      Block(MakeTuning({0, 64, 64, 64}, {64, 64, 64, 64}, {64, 64, 64, 64}, {64, 64, 64, 64})),
-      IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 40.0f), output));
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(MakeBlcTuning({0, 64, 64, 64}, {64, 64, 64, 64},
+                                                      {64, 64, 64, 64}, {64, 64, 64, 64})),
+                               IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 40.0f),
+                               output));
   EXPECT_EQ(output.gains[0], 8192u);
   EXPECT_EQ(output.gains[1], 10922u);
 }
@@ -546,9 +530,10 @@ TEST(TranslateBlcIppTest, NonPositiveStretchOfAnEntryGivesAZeroGain) {
   // At depth 14 a pedestal of 16384 is raw 16384, which reads as -16384: its stretch is
   // 16383 / -1, and a negative gain truncates to 0. It is also the least entry, which makes
   // max_stretch negative and the format 4 integer bits.
-  TAVIK_ASSERT_OK(TranslateBlc(
-      Block(MakeTuning({16384, 64, 64, 64}, {64, 64, 64, 64}, {64, 64, 64, 64}, {64, 64, 64, 64})),
-      IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 14, 1.0f), output));
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(MakeBlcTuning({16384, 64, 64, 64}, {64, 64, 64, 64},
+                                                      {64, 64, 64, 64}, {64, 64, 64, 64})),
+                               IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 14, 1.0f),
+                               output));
   EXPECT_EQ(output.offsets[0], 16384u);
   EXPECT_EQ(output.gain_integer_bits, 4u);
   EXPECT_EQ(output.gains[0], 0u);
@@ -559,8 +544,9 @@ TEST(TranslateBlcIppTest, NonPositiveStretchOfAnEntryGivesAZeroGain) {
 
 TEST(TranslateBlcG3aaOffsetTest, ChecksComeInTheirOrder) {
   const BlcInput input = IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 1.0f);
-  EXPECT_THAT(TranslateBlc(Block(UniformTuning(64)), input, static_cast<BlcConfigValue*>(nullptr)),
-              StatusIs(kInvalid, "Output is null pointer!"));
+  EXPECT_THAT(
+      TranslateBlc(BlcBlock(UniformBlcTuning(64)), input, static_cast<BlcConfigValue*>(nullptr)),
+      StatusIs(kInvalid, "Output is null pointer!"));
 
   BlcConfigValue value = PatternFilled<BlcConfigValue>();
   const BlcConfigValue before = value;
@@ -568,19 +554,19 @@ TEST(TranslateBlcG3aaOffsetTest, ChecksComeInTheirOrder) {
               StatusIs(kInvalid, "Invalid TuningBlock!"));
   EXPECT_TRUE(SameBytes(value, before));
 
-  zm::BlcTuning no_static = UniformTuning(64);
+  zm::BlcTuning no_static = UniformBlcTuning(64);
   no_static.clear_static_param();
   no_static.clear_dynamic_param();
-  EXPECT_THAT(TranslateBlc(Block(no_static), input, &value),
+  EXPECT_THAT(TranslateBlc(BlcBlock(no_static), input, &value),
               StatusIs(kInvalid, "BlcTuning proto doesn't have static param!"));
   EXPECT_TRUE(SameBytes(value, before));
 }
 
 TEST(TranslateBlcG3aaOffsetTest, MissingDynamicParamIsRefusedAfterEnableAndPixelOrder) {
-  zm::BlcTuning tuning = UniformTuning(64, /*enable=*/false);
+  zm::BlcTuning tuning = UniformBlcTuning(64, /*enable=*/false);
   tuning.clear_dynamic_param();
   BlcConfigValue value = PatternFilled<BlcConfigValue>();
-  EXPECT_THAT(TranslateBlc(Block(tuning),
+  EXPECT_THAT(TranslateBlc(BlcBlock(tuning),
                            IppInput(vosbrine::GBRG, vosbrine::SENSOR_TYPE_BAYER, 10, 1.0f), &value),
               StatusIs(kInvalid, "BlcTuning proto doesn't have dynamic param!"));
   EXPECT_EQ(value.enable, 0u);
@@ -592,16 +578,16 @@ TEST(TranslateBlcG3aaOffsetTest, MissingDynamicParamIsRefusedAfterEnableAndPixel
 
 TEST(TranslateBlcG3aaOffsetTest, DepthSixteenIsRefusedAndFifteenUsesScaleOne) {
   BlcConfigValue value = PatternFilled<BlcConfigValue>();
-  EXPECT_THAT(TranslateBlc(Block(UniformTuning(64)),
+  EXPECT_THAT(TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                            IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 16, 1.0f), &value),
               StatusIs(kInvalid, "Sensor bit depth is larger than g3aa pipeline!16"));
   EXPECT_EQ(Words<uint64_t>(value)[0] >> 3, 0xA5A5A5A5A5A5A5A5u >> 3);  // Offsets unwritten.
 
-  TAVIK_ASSERT_OK(TranslateBlc(Block(UniformTuning(64)),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 15, 1.0f),
                                &value));
   EXPECT_EQ(value.offset_r, 64u);
-  TAVIK_ASSERT_OK(TranslateBlc(Block(UniformTuning(64)),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 14, 1.0f),
                                &value));
   EXPECT_EQ(value.offset_r, 128u);
@@ -614,16 +600,16 @@ TEST(TranslateBlcG3aaOffsetTest, OffsetAboveFullScaleIsRefusedAtTheFirstSuchChan
   BlcConfigValue value = {};
   const BlcInput input = IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 1.0f);
   // 1025 x 32 = 32800.
-  EXPECT_THAT(TranslateBlc(Block(MakeTuning({64}, {1025}, {2000}, {64})), input, &value),
+  EXPECT_THAT(TranslateBlc(BlcBlock(MakeBlcTuning({64}, {1025}, {2000}, {64})), input, &value),
               StatusIs(kInvalid, "Offset is too large to calculate stretch gain! 32800"));
   // 32768 exactly passes and fills the 16 bits.
-  TAVIK_ASSERT_OK(TranslateBlc(Block(MakeTuning({64}, {1024}, {64}, {64})), input, &value));
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(MakeBlcTuning({64}, {1024}, {64}, {64})), input, &value));
   EXPECT_EQ(value.offset_gr, 32768u);
 }
 
 TEST(TranslateBlcG3aaOffsetTest, ReadsElementZeroWithoutASizeTest) {
   BlcConfigValue value = {};
-  TAVIK_ASSERT_OK(TranslateBlc(Block(MakeTuning({10, 99}, {20}, {}, {40, 1, 2, 3, 4, 5, 6})),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(MakeBlcTuning({10, 99}, {20}, {}, {40, 1, 2, 3, 4, 5, 6})),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 15, 1.0f),
                                &value));
   EXPECT_EQ(value.offset_r, 10u);
@@ -640,7 +626,7 @@ TEST(TranslateBlcG3aaOffsetTest, OffsetsStayInChannelOrderWhateverThePattern) {
   for (const Case& c : {Case{vosbrine::RGGB, 0}, Case{vosbrine::BGGR, 3}, Case{vosbrine::GRBG, 1},
                         Case{vosbrine::GBRG, 2}}) {
     BlcConfigValue value = {};
-    TAVIK_ASSERT_OK(TranslateBlc(Block(NumberedTuning()),
+    TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(NumberedTuning()),
                                  IppInput(c.pattern, vosbrine::SENSOR_TYPE_BAYER, 15, 1.0f),
                                  &value));
     EXPECT_EQ(value.pixel_order, c.code);
@@ -653,7 +639,7 @@ TEST(TranslateBlcG3aaOffsetTest, OffsetsStayInChannelOrderWhateverThePattern) {
 
 TEST(TranslateBlcG3aaOffsetTest, OffsetsTruncateAndNegativeOnesWrapToSixteenBits) {
   BlcConfigValue value = {};
-  TAVIK_ASSERT_OK(TranslateBlc(Block(MakeTuning({64.99f}, {-1}, {-64.99f}, {0.5f})),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(MakeBlcTuning({64.99f}, {-1}, {-64.99f}, {0.5f})),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 15, 1.0f),
                                &value));
   EXPECT_EQ(value.offset_r, 64u);
@@ -666,27 +652,28 @@ TEST(TranslateBlcG3aaOffsetTest, OffsetsTruncateAndNegativeOnesWrapToSixteenBits
 
 TEST(TranslateBlcG3aaGainTest, ChecksComeInTheirOrder) {
   const BlcInput input = IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 1.0f);
-  EXPECT_THAT(TranslateBlc(Block(UniformTuning(64)), input, static_cast<DgConfigValue*>(nullptr)),
-              StatusIs(kInvalid, "Output is null pointer!"));
+  EXPECT_THAT(
+      TranslateBlc(BlcBlock(UniformBlcTuning(64)), input, static_cast<DgConfigValue*>(nullptr)),
+      StatusIs(kInvalid, "Output is null pointer!"));
   DgConfigValue value = PatternFilled<DgConfigValue>();
   const DgConfigValue before = value;
   EXPECT_THAT(TranslateBlc(ForeignBlock(), input, &value),
               StatusIs(kInvalid, "Invalid TuningBlock!"));
-  zm::BlcTuning no_dynamic = UniformTuning(64);
+  zm::BlcTuning no_dynamic = UniformBlcTuning(64);
   no_dynamic.clear_dynamic_param();
-  EXPECT_THAT(TranslateBlc(Block(no_dynamic), input, &value),
+  EXPECT_THAT(TranslateBlc(BlcBlock(no_dynamic), input, &value),
               StatusIs(kInvalid, "BlcTuning proto doesn't have dynamic param!"));
   // The depth and the offsets are tested before the gain.
-  EXPECT_THAT(TranslateBlc(Block(UniformTuning(64)),
+  EXPECT_THAT(TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                            IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 16, 0.5f), &value),
               StatusIs(kInvalid, "Sensor bit depth is larger than g3aa pipeline!16"));
-  EXPECT_THAT(TranslateBlc(Block(UniformTuning(2000)),
+  EXPECT_THAT(TranslateBlc(BlcBlock(UniformBlcTuning(2000)),
                            IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 0.5f), &value),
               StatusIs(kInvalid, "Offset is too large to calculate stretch gain! 64000"));
-  EXPECT_THAT(TranslateBlc(Block(UniformTuning(64)),
+  EXPECT_THAT(TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                            IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 0.5f), &value),
               StatusIs(kInvalid, "Digital gain is lower than 1!"));
-  EXPECT_THAT(TranslateBlc(Block(UniformTuning(64)),
+  EXPECT_THAT(TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                            IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10,
                                     std::numeric_limits<float>::quiet_NaN()),
                            &value),
@@ -695,11 +682,11 @@ TEST(TranslateBlcG3aaGainTest, ChecksComeInTheirOrder) {
 }
 
 TEST(TranslateBlcG3aaGainTest, NeedsNoStaticParamAndEnablesWhateverTheTuningSays) {
-  zm::BlcTuning tuning = UniformTuning(64, /*enable=*/false);
+  zm::BlcTuning tuning = UniformBlcTuning(64, /*enable=*/false);
   tuning.clear_static_param();
   DgConfigValue value = {};
   TAVIK_ASSERT_OK(TranslateBlc(
-      Block(tuning), IppInput(vosbrine::BGGR, vosbrine::SENSOR_TYPE_BAYER, 10, 20.0f), &value));
+      BlcBlock(tuning), IppInput(vosbrine::BGGR, vosbrine::SENSOR_TYPE_BAYER, 10, 20.0f), &value));
   EXPECT_EQ(value.enable, 1u);
   EXPECT_EQ(value.pixel_order, 3u);
   // 32768 / 30720 x 20 x 65536 = 1398101.3.
@@ -712,7 +699,7 @@ TEST(TranslateBlcG3aaGainTest, NeedsNoStaticParamAndEnablesWhateverTheTuningSays
 TEST(TranslateBlcG3aaGainTest, EachCappedChannelLogsOneLine) {
   ScopedLogCapture log;
   DgConfigValue value = {};
-  TAVIK_ASSERT_OK(TranslateBlc(Block(UniformTuning(64)),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(UniformBlcTuning(64)),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 31.0f),
                                &value));
   // Stretch 1.0666667 x 31 = 33.07: the gain becomes 32 / 1.0666667 = 30, and 1.0666667 x 30 x
@@ -729,7 +716,7 @@ TEST(TranslateBlcG3aaGainTest, OnlyCappedChannelsLog) {
   ScopedLogCapture log;
   DgConfigValue value = {};
   // Stretch of r: 1 (no pedestal); of b: 32768 / 30720. At gain 31 only b passes 32.
-  TAVIK_ASSERT_OK(TranslateBlc(Block(MakeTuning({0}, {0}, {0}, {64})),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(MakeBlcTuning({0}, {0}, {0}, {64})),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 10, 31.0f),
                                &value));
   EXPECT_THAT(log.messages(android::base::ERROR), ElementsAre(kCapLine31));
@@ -740,7 +727,7 @@ TEST(TranslateBlcG3aaGainTest, OnlyCappedChannelsLog) {
 TEST(TranslateBlcG3aaGainTest, ComputedZeroBecomesOne) {
   DgConfigValue value = {};
   // A pedestal of -1e10 gives a stretch of 3.3e-6: 0.21 after scaling, truncated to 0.
-  TAVIK_ASSERT_OK(TranslateBlc(Block(MakeTuning({-1e10f}, {64}, {64}, {std::nanf("")})),
+  TAVIK_ASSERT_OK(TranslateBlc(BlcBlock(MakeBlcTuning({-1e10f}, {64}, {64}, {std::nanf("")})),
                                IppInput(vosbrine::RGGB, vosbrine::SENSOR_TYPE_BAYER, 15, 1.0f),
                                &value));
   EXPECT_EQ(value.gain_r, 1u);
@@ -753,7 +740,7 @@ TEST(TranslateBlcG3aaGainTest, UnknownPatternLogsAndWritesCodeZero) {
   ScopedLogCapture log;
   DgConfigValue value = PatternFilled<DgConfigValue>();
   TAVIK_ASSERT_OK(TranslateBlc(
-      Block(UniformTuning(64)),
+      BlcBlock(UniformBlcTuning(64)),
       IppInput(static_cast<vosbrine::BayerPattern>(9), vosbrine::SENSOR_TYPE_BAYER, 10, 1.0f),
       &value));
   EXPECT_EQ(value.pixel_order, 0u);
@@ -766,7 +753,7 @@ TEST(CalculateG3AAOffsetGainsTest, GivesOffsetsAndStretchesInChannelOrder) {
   std::array<double, 4> offsets;
   std::array<double, 4> stretch_gains;
   TAVIK_ASSERT_OK(
-      CalculateG3AAOffsetGains(MakeTuning({64}, {0}, {512}, {-64}), 10, offsets, stretch_gains));
+      CalculateG3AAOffsetGains(MakeBlcTuning({64}, {0}, {512}, {-64}), 10, offsets, stretch_gains));
   EXPECT_THAT(offsets, ElementsAre(2048.0, 0.0, 16384.0, -2048.0));
   EXPECT_THAT(stretch_gains, ElementsAre(32768.0 / 30720.0, 1.0, 2.0, 32768.0 / 34816.0));
 }
@@ -774,7 +761,7 @@ TEST(CalculateG3AAOffsetGainsTest, GivesOffsetsAndStretchesInChannelOrder) {
 TEST(CalculateG3AAOffsetGainsTest, DepthOfSixteenOrMoreIsRefusedWithoutABlank) {
   std::array<double, 4> offsets;
   std::array<double, 4> stretch_gains;
-  EXPECT_THAT(CalculateG3AAOffsetGains(UniformTuning(64), 20, offsets, stretch_gains),
+  EXPECT_THAT(CalculateG3AAOffsetGains(UniformBlcTuning(64), 20, offsets, stretch_gains),
               StatusIs(kInvalid, "Sensor bit depth is larger than g3aa pipeline!20"));
 }
 
@@ -782,7 +769,7 @@ TEST(CalculateG3AAOffsetGainsTest, OffsetTextShowsSixSignificantDigits) {
   std::array<double, 4> offsets;
   std::array<double, 4> stretch_gains;
   // 1234.5678 x 32 = 39506.17 in single precision.
-  EXPECT_THAT(CalculateG3AAOffsetGains(MakeTuning({64}, {64}, {64}, {1234.5678f}), 10, offsets,
+  EXPECT_THAT(CalculateG3AAOffsetGains(MakeBlcTuning({64}, {64}, {64}, {1234.5678f}), 10, offsets,
                                        stretch_gains),
               StatusIs(kInvalid, "Offset is too large to calculate stretch gain! 39506.2"));
 }
@@ -790,7 +777,7 @@ TEST(CalculateG3AAOffsetGainsTest, OffsetTextShowsSixSignificantDigits) {
 // --- GetDynamicBlc -----------------------------------------------------------------------------
 
 TEST(GetDynamicBlcTest, GivesElementZeroInTheRasterOrderOfTheQuad) {
-  const ZelTuningBlock<zm::BlcTuning> block = Block(NumberedTuning());
+  const ZelTuningBlock<zm::BlcTuning> block = BlcBlock(NumberedTuning());
   EXPECT_THAT(GetDynamicBlc(block, vosbrine::RGGB), ElementsAre(1, 5, 9, 13));
   EXPECT_THAT(GetDynamicBlc(block, vosbrine::BGGR), ElementsAre(13, 9, 5, 1));
   EXPECT_THAT(GetDynamicBlc(block, vosbrine::GRBG), ElementsAre(5, 1, 13, 9));
@@ -798,7 +785,7 @@ TEST(GetDynamicBlcTest, GivesElementZeroInTheRasterOrderOfTheQuad) {
 }
 
 TEST(GetDynamicBlcTest, EmptyArrayGivesZero) {
-  EXPECT_THAT(GetDynamicBlc(Block(MakeTuning({3}, {}, {5}, {6})), vosbrine::RGGB),
+  EXPECT_THAT(GetDynamicBlc(BlcBlock(MakeBlcTuning({3}, {}, {5}, {6})), vosbrine::RGGB),
               ElementsAre(3, 0, 5, 6));
 }
 
@@ -813,7 +800,7 @@ TEST(GetDynamicBlcTest, NoUsableBlockGives64FourTimesWithALogLine) {
     ScopedLogCapture log;
     zm::BlcTuning tuning = NumberedTuning();
     tuning.clear_dynamic_param();
-    EXPECT_THAT(GetDynamicBlc(Block(tuning), vosbrine::GBRG), ElementsAre(64, 64, 64, 64));
+    EXPECT_THAT(GetDynamicBlc(BlcBlock(tuning), vosbrine::GBRG), ElementsAre(64, 64, 64, 64));
     EXPECT_THAT(log.messages(android::base::ERROR), ElementsAre(kLine));
   }
 }

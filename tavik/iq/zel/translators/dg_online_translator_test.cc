@@ -13,6 +13,7 @@
 #include "tavik/base/testing/log_capture.h"
 #include "tavik/base/testing/status_matchers.h"
 #include "tavik/base/trace.h"
+#include "tavik/iq/testing/blc_tunings.h"
 #include "tavik/iq/testing/translator_testing.h"
 #include "tavik/iq/zel/zel_tuning_block.h"
 
@@ -26,34 +27,15 @@ using ::testing::ElementsAre;
 using ::testing::IsEmpty;
 
 namespace zm = ::vosbrine::zelmondrake;
+using ::tavik::test::BlcBlock;
 using ::tavik::test::ForeignBlock;
+using ::tavik::test::MakeBlcTuning;
 using ::tavik::test::PatternFilled;
 using ::tavik::test::RecordingTraceSink;
 using ::tavik::test::SameBytes;
+using ::tavik::test::UniformBlcTuning;
 
 constexpr absl::StatusCode kInvalid = absl::StatusCode::kInvalidArgument;
-
-zm::BlcTuning MakeTuning(std::vector<float> r, std::vector<float> gr, std::vector<float> gb,
-                         std::vector<float> b, bool enable = true) {
-  zm::BlcTuning tuning;
-  tuning.set_enable(enable);
-  tuning.mutable_static_param();
-  zm::BlcDynamicParam& dynamic = *tuning.mutable_dynamic_param();
-  for (float value : r) dynamic.add_offsets_r(value);
-  for (float value : gr) dynamic.add_offsets_gr(value);
-  for (float value : gb) dynamic.add_offsets_gb(value);
-  for (float value : b) dynamic.add_offsets_b(value);
-  return tuning;
-}
-
-zm::BlcTuning UniformTuning(float offset, bool enable = true) {
-  const std::vector<float> four(4, offset);
-  return MakeTuning(four, four, four, four, enable);
-}
-
-ZelTuningBlock<zm::BlcTuning> Block(zm::BlcTuning tuning) {
-  return ZelTuningBlock<zm::BlcTuning>(std::move(tuning));
-}
 
 DgConfigValue Filled() { return PatternFilled<DgConfigValue>(); }
 
@@ -96,24 +78,24 @@ TEST(TranslateDgTest, BlockOfAnotherTypeIsInvalid) {
 TEST(TranslateDgTest, MissingDynamicParamIsRefusedButStaticParamIsNotNeeded) {
   DgConfigValue value = Filled();
   const DgConfigValue before = value;
-  zm::BlcTuning no_dynamic = UniformTuning(64);
+  zm::BlcTuning no_dynamic = UniformBlcTuning(64);
   no_dynamic.clear_dynamic_param();
-  EXPECT_THAT(TranslateDg(Block(no_dynamic), DgInput{vosbrine::RGGB, 10, 1.0f}, value),
+  EXPECT_THAT(TranslateDg(BlcBlock(no_dynamic), DgInput{vosbrine::RGGB, 10, 1.0f}, value),
               StatusIs(kInvalid, "BlcTuning proto doesn't have dynamic param!"));
   EXPECT_TRUE(SameBytes(value, before));
 
-  zm::BlcTuning no_static = UniformTuning(64);
+  zm::BlcTuning no_static = UniformBlcTuning(64);
   no_static.clear_static_param();
-  TAVIK_ASSERT_OK(TranslateDg(Block(no_static), DgInput{vosbrine::RGGB, 10, 1.0f}, value));
+  TAVIK_ASSERT_OK(TranslateDg(BlcBlock(no_static), DgInput{vosbrine::RGGB, 10, 1.0f}, value));
   EXPECT_EQ(value.gain_r, 69905u);
 }
 
 TEST(TranslateDgTest, DepthIsTestedBeforeEmptyArrays) {
   DgConfigValue value = Filled();
   const DgConfigValue before = value;
-  EXPECT_THAT(
-      TranslateDg(Block(MakeTuning({}, {}, {}, {})), DgInput{vosbrine::RGGB, 16, 1.0f}, value),
-      StatusIs(kInvalid, "Sensor bit depth is larger than g3aa pipeline!16"));
+  EXPECT_THAT(TranslateDg(BlcBlock(MakeBlcTuning({}, {}, {}, {})),
+                          DgInput{vosbrine::RGGB, 16, 1.0f}, value),
+              StatusIs(kInvalid, "Sensor bit depth is larger than g3aa pipeline!16"));
   EXPECT_TRUE(SameBytes(value, before));
 }
 
@@ -123,10 +105,10 @@ TEST(TranslateDgTest, AnyEmptyArrayIsRefused) {
     SCOPED_TRACE(empty);
     DgConfigValue value = Filled();
     const DgConfigValue before = value;
-    zm::BlcTuning tuning = MakeTuning(
+    zm::BlcTuning tuning = MakeBlcTuning(
         empty == 0 ? std::vector<float>{} : one, empty == 1 ? std::vector<float>{} : one,
         empty == 2 ? std::vector<float>{} : one, empty == 3 ? std::vector<float>{} : one);
-    EXPECT_THAT(TranslateDg(Block(tuning), DgInput{vosbrine::RGGB, 15, 1.0f}, value),
+    EXPECT_THAT(TranslateDg(BlcBlock(tuning), DgInput{vosbrine::RGGB, 15, 1.0f}, value),
                 StatusIs(kInvalid, "Offsets can't be empty in blc dynamic parameters."));
     EXPECT_TRUE(SameBytes(value, before));
   }
@@ -136,13 +118,13 @@ TEST(TranslateDgTest, OffsetTestComesBeforeTheGainTest) {
   DgConfigValue value = Filled();
   const DgConfigValue before = value;
   // 2000 x 32 = 64000.
-  EXPECT_THAT(TranslateDg(Block(MakeTuning({64}, {64}, {2000}, {64})),
+  EXPECT_THAT(TranslateDg(BlcBlock(MakeBlcTuning({64}, {64}, {2000}, {64})),
                           DgInput{vosbrine::RGGB, 10, 0.5f}, value),
               StatusIs(kInvalid, "Offset is too large to calculate stretch gain! 64000"));
-  EXPECT_THAT(TranslateDg(Block(UniformTuning(64)), DgInput{vosbrine::RGGB, 10, 0.5f}, value),
+  EXPECT_THAT(TranslateDg(BlcBlock(UniformBlcTuning(64)), DgInput{vosbrine::RGGB, 10, 0.5f}, value),
               StatusIs(kInvalid, "Digital gain is lower than 1!"));
   EXPECT_THAT(
-      TranslateDg(Block(UniformTuning(64)),
+      TranslateDg(BlcBlock(UniformBlcTuning(64)),
                   DgInput{vosbrine::RGGB, 10, std::numeric_limits<float>::quiet_NaN()}, value),
       StatusIs(kInvalid, "Digital gain is lower than 1!"));
   EXPECT_TRUE(SameBytes(value, before));
@@ -151,16 +133,18 @@ TEST(TranslateDgTest, OffsetTestComesBeforeTheGainTest) {
 TEST(TranslateDgTest, DepthFifteenPassesWithScaleOneAndFourteenHasScaleTwo) {
   DgConfigValue value = {};
   // 32768 / (32768 - 64) x 65536 = 65664.25.
-  TAVIK_ASSERT_OK(TranslateDg(Block(UniformTuning(64)), DgInput{vosbrine::RGGB, 15, 1.0f}, value));
+  TAVIK_ASSERT_OK(
+      TranslateDg(BlcBlock(UniformBlcTuning(64)), DgInput{vosbrine::RGGB, 15, 1.0f}, value));
   EXPECT_EQ(value.gain_r, 65664u);
   // 32768 / (32768 - 128) x 65536 = 65793.004.
-  TAVIK_ASSERT_OK(TranslateDg(Block(UniformTuning(64)), DgInput{vosbrine::RGGB, 14, 1.0f}, value));
+  TAVIK_ASSERT_OK(
+      TranslateDg(BlcBlock(UniformBlcTuning(64)), DgInput{vosbrine::RGGB, 14, 1.0f}, value));
   EXPECT_EQ(value.gain_r, 65793u);
 }
 
 TEST(TranslateDgTest, UsesElementZeroOfArraysOfAnySize) {
   DgConfigValue value = {};
-  TAVIK_ASSERT_OK(TranslateDg(Block(MakeTuning({0, 64}, {64}, {512, 1, 2}, {0})),
+  TAVIK_ASSERT_OK(TranslateDg(BlcBlock(MakeBlcTuning({0, 64}, {64}, {512, 1, 2}, {0})),
                               DgInput{vosbrine::RGGB, 10, 1.0f}, value));
   EXPECT_EQ(value.gain_r, 65536u);
   EXPECT_EQ(value.gain_gr, 69905u);
@@ -176,7 +160,7 @@ TEST(TranslateDgTest, EnablesAndWritesThePixelOrderWhateverTheTuningSays) {
   for (const Case& c : {Case{vosbrine::RGGB, 0}, Case{vosbrine::BGGR, 3}, Case{vosbrine::GRBG, 1},
                         Case{vosbrine::GBRG, 2}}) {
     DgConfigValue value = Filled();
-    TAVIK_ASSERT_OK(TranslateDg(Block(UniformTuning(64, /*enable=*/false)),
+    TAVIK_ASSERT_OK(TranslateDg(BlcBlock(UniformBlcTuning(64, /*enable=*/false)),
                                 DgInput{c.pattern, 10, 1.0f}, value));
     EXPECT_EQ(value.enable, 1u);
     EXPECT_EQ(value.pixel_order, c.code);
@@ -187,7 +171,7 @@ TEST(TranslateDgTest, EnablesAndWritesThePixelOrderWhateverTheTuningSays) {
 TEST(TranslateDgTest, CapLineHasABlankAfterUnder) {
   ScopedLogCapture log;
   DgConfigValue value = {};
-  TAVIK_ASSERT_OK(TranslateDg(Block(MakeTuning({64}, {0}, {64}, {0})),
+  TAVIK_ASSERT_OK(TranslateDg(BlcBlock(MakeBlcTuning({64}, {0}, {64}, {0})),
                               DgInput{vosbrine::RGGB, 10, 31.0f}, value));
   constexpr char kLine[] =
       "Max digital gain * stretch_gain should be under 32. If not, it is capped to "
@@ -202,14 +186,15 @@ TEST(TranslateDgTest, CapLineHasABlankAfterUnder) {
 TEST(TranslateDgTest, NoCapNoLog) {
   ScopedLogCapture log;
   DgConfigValue value = {};
-  TAVIK_ASSERT_OK(TranslateDg(Block(UniformTuning(64)), DgInput{vosbrine::RGGB, 10, 20.0f}, value));
+  TAVIK_ASSERT_OK(
+      TranslateDg(BlcBlock(UniformBlcTuning(64)), DgInput{vosbrine::RGGB, 10, 20.0f}, value));
   EXPECT_THAT(log.messages(android::base::ERROR), IsEmpty());
   EXPECT_EQ(value.gain_r, 1398101u);  // 32768 / 30720 x 20 x 65536 = 1398101.3.
 }
 
 TEST(TranslateDgTest, ComputedZeroBecomesOne) {
   DgConfigValue value = {};
-  TAVIK_ASSERT_OK(TranslateDg(Block(MakeTuning({-1e10f}, {64}, {64}, {64})),
+  TAVIK_ASSERT_OK(TranslateDg(BlcBlock(MakeBlcTuning({-1e10f}, {64}, {64}, {64})),
                               DgInput{vosbrine::RGGB, 15, 1.0f}, value));
   EXPECT_EQ(value.gain_r, 1u);
   EXPECT_EQ(value.gain_gr, 65664u);
