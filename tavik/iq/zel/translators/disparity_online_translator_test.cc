@@ -1,0 +1,1 @@
+#include "tavik/iq/zel/translators/disparity_online_translator.h"

@@ -1,0 +1,1 @@
+#include "tavik/iq/zel/translators/dmsc_online_translator.h"

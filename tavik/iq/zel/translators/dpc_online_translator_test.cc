@@ -1,0 +1,1 @@
+#include "tavik/iq/zel/translators/dpc_online_translator.h"

@@ -1,0 +1,1 @@
+#include "tavik/iq/zel/translators/edgedet_online_translator.h"

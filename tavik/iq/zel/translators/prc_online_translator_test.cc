@@ -1,0 +1,1 @@
+#include "tavik/iq/zel/translators/prc_online_translator.h"

@@ -1,0 +1,1 @@
+#include "tavik/iq/zel/translators/skind_online_translator.h"
