@@ -75,8 +75,7 @@ DmscInput DmscInputOf(const FrameFacts& facts) {
 
 Status TranslateDmsc(const TuningBlock& block, const DmscInput& input, DmscOutput& output) {
   PerfTrace trace(kTranslatorTraceCategory, "TranslateDmsc");
-  // The stage's own code never told a block of another type from an empty one; here it is
-  // refused like everywhere else rather than read.
+  // A block of another type is the caller's mistake, but it is refused, not read, as everywhere.
   TAVIK_ASSIGN_OR_RETURN(const zm::DmscTuning* tuning, RequireTuning<zm::DmscTuning>(block));
   TAVIK_RETURN_IF_ERROR(RequireDynamic(*tuning));
   TAVIK_RETURN_IF_ERROR(RequireStatic(*tuning));

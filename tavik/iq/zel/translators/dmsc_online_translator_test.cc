@@ -238,8 +238,8 @@ TEST(TranslateDmscTest, RegionInfoIsCheckedFirst) {
   EXPECT_TRUE(SameBytes(output, PatternFilled<DmscOutput>()));
 }
 
-// The stage's own code reads a block of another type without looking; here it is refused, as
-// every translator refuses it, and nothing is written.
+// A block of another type is the caller's mistake; it is refused, not read, and nothing is
+// written.
 TEST(TranslateDmscTest, BlockOfAnotherTypeIsRefusedLikeEverywhereElse) {
   ScopedLogCapture log;
   DmscOutput output = PatternFilled<DmscOutput>();
