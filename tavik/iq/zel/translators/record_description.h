@@ -180,18 +180,21 @@ constexpr uint64_t SplitFieldHigh(uint64_t value, int low_width) { return value 
         TAVIK_SET_FIELD(r, member##_hi, ::tavik::SplitFieldHigh(value, kLowWidth));            \
       })
 
-// An array member whose entries hold `width` bits each (at most the entry type's).
-#define TAVIK_TABLE(member, width)                                                             \
-  ::tavik::record_description_internal::Table(                                                 \
-      #member, (width), static_cast<int>(std::extent_v<decltype(TavikRecord_::member)>),       \
-      offsetof(TavikRecord_, member),                                                          \
-      [](const void* record, int index) -> uint64_t {                                          \
-        return static_cast<uint64_t>(static_cast<const TavikRecord_*>(record)->member[index]); \
-      },                                                                                       \
-      [](void* record, int index, uint64_t value) {                                            \
-        static_cast<TavikRecord_*>(record)->member[index] =                                    \
-            static_cast<std::remove_extent_t<decltype(TavikRecord_::member)>>(                 \
-                ::tavik::FieldBits(value, (width)));                                           \
+// An array member whose entries hold `width` bits each (at most the entry type's). Entries of a
+// signed type read as their raw bits too: -1 in a 16-bit table reads 0xFFFF.
+#define TAVIK_TABLE(member, width)                                                          \
+  ::tavik::record_description_internal::Table(                                              \
+      #member, (width), static_cast<int>(std::extent_v<decltype(TavikRecord_::member)>),    \
+      offsetof(TavikRecord_, member),                                                       \
+      [](const void* record, int index) -> uint64_t {                                       \
+        return ::tavik::FieldBits(                                                          \
+            static_cast<uint64_t>(static_cast<const TavikRecord_*>(record)->member[index]), \
+            (width));                                                                       \
+      },                                                                                    \
+      [](void* record, int index, uint64_t value) {                                         \
+        static_cast<TavikRecord_*>(record)->member[index] =                                 \
+            static_cast<std::remove_extent_t<decltype(TavikRecord_::member)>>(              \
+                ::tavik::FieldBits(value, (width)));                                        \
       })
 
 // Declares the description of `Record`, in the record's own namespace, with the fields in record

@@ -35,6 +35,21 @@ struct SampleRecord {
 TAVIK_DESCRIBE_RECORD(SampleRecord, 32, TAVIK_FIELD(bypass), TAVIK_SPLIT_FIELD(gain),
                       TAVIK_FIELD(level), TAVIK_FIELD(plain), TAVIK_TABLE(lut, 12));
 
+// A group of fields that a record repeats (the levels of a threshold), kept in a struct of its
+// own and described with dotted names, and a table of signed entries.
+struct Levels {
+  uint32_t level_0 : 14;
+  uint32_t : 2;
+  uint32_t level_1 : 14;
+  uint32_t : 2;
+};
+struct GroupedRecord {
+  Levels thresholds;
+  int16_t shifts[4];
+};
+TAVIK_DESCRIBE_RECORD(GroupedRecord, 32, TAVIK_FIELD(thresholds.level_0),
+                      TAVIK_FIELD(thresholds.level_1), TAVIK_TABLE(shifts, 16));
+
 // Widths come from the members, at compile time.
 static_assert(TAVIK_BIT_WIDTH(SampleRecord, bypass) == 1);
 static_assert(TAVIK_BIT_WIDTH(SampleRecord, gain_lo) == 20);
@@ -132,6 +147,32 @@ TEST(RecordDescriptionTest, SplitHelpersJoinAndSplit) {
   EXPECT_EQ(SplitFieldHigh(0xFFFF, 13), 0x7u);
   EXPECT_EQ(FieldBits(~uint64_t{0}, 64), ~uint64_t{0});
   EXPECT_EQ(FieldBits(0xFF, 4), 0xFu);
+}
+
+TEST(RecordDescriptionTest, NestedGroupFieldsHaveDottedNamesAndTheirOwnWidths) {
+  const RecordDescription& record = RecordDescriptionOf<GroupedRecord>();
+  EXPECT_EQ(record.header_size, offsetof(GroupedRecord, shifts));
+  const FieldDescription& level_1 = Field(record, "thresholds.level_1");
+  EXPECT_EQ(level_1.width, 14);
+  GroupedRecord value = PatternFilled<GroupedRecord>();
+  level_1.set(&value, 0, 0xFFFFF);
+  EXPECT_EQ(value.thresholds.level_1, 0x3FFFu);
+  EXPECT_EQ(level_1.get(&value, 0), 0x3FFFu);
+  uint32_t word = 0;
+  std::memcpy(&word, &value, 4);
+  EXPECT_EQ(word, 0xBFFFA5A5u);  // Bits 30-31 and the low half are the pattern's.
+}
+
+TEST(RecordDescriptionTest, SignedTableEntriesReadAsTheirRawBits) {
+  const RecordDescription& record = RecordDescriptionOf<GroupedRecord>();
+  const FieldDescription& shifts = Field(record, "shifts");
+  GroupedRecord value{};
+  value.shifts[1] = -1;
+  value.shifts[2] = -24575;
+  EXPECT_EQ(shifts.get(&value, 1), 0xFFFFu);
+  EXPECT_EQ(shifts.get(&value, 2), 0xA001u);
+  shifts.set(&value, 3, 0xFFFE);
+  EXPECT_EQ(value.shifts[3], -2);
 }
 
 // The library's own records: register values are described in 64-bit words, split fields as one.

@@ -6,16 +6,36 @@
 
 #include "tavik/iq/zel/translators/blc_online_translator.h"
 #include "tavik/iq/zel/translators/dg_online_translator.h"
+#include "tavik/iq/zel/translators/disparity_online_translator.h"
+#include "tavik/iq/zel/translators/dmsc_online_translator.h"
+#include "tavik/iq/zel/translators/dpc_online_translator.h"
+#include "tavik/iq/zel/translators/edgedet_online_translator.h"
 #include "tavik/iq/zel/translators/gamma_online_translator.h"
+#include "tavik/iq/zel/translators/prc_online_translator.h"
+#include "tavik/iq/zel/translators/sensor_gamma_online_translator.h"
+#include "tavik/iq/zel/translators/skind_online_translator.h"
 
 namespace tavik {
 namespace {
 
 // One row per form, in the blocks' position order.
 constexpr const TranslatorForm* kTable[] = {
-    &translator_forms::kBlcIpp,       &translator_forms::kBlcG3aaOffsets,
-    &translator_forms::kBlcG3aaGains, &translator_forms::kDg,
-    &translator_forms::kGammaItp,     &translator_forms::kGammaG3aa,
+    &translator_forms::kBlcIpp,
+    &translator_forms::kBlcG3aaOffsets,
+    &translator_forms::kBlcG3aaGains,
+    &translator_forms::kDg,
+    &translator_forms::kDisparityIpp,
+    &translator_forms::kDisparityG3aa,
+    &translator_forms::kDmsc,
+    &translator_forms::kDpcIpp,
+    &translator_forms::kDpcG3aa,
+    &translator_forms::kEdgedet,
+    &translator_forms::kGammaItp,
+    &translator_forms::kGammaG3aa,
+    &translator_forms::kPrc,
+    &translator_forms::kSensorGammaProIpp,
+    &translator_forms::kSensorGammaG3aa,
+    &translator_forms::kSkind,
 };
 
 // Stands for a block that the frame does not have. No translator's type matches it, so each

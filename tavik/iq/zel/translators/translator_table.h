@@ -47,6 +47,12 @@ struct FrameFacts {
   int32_t sensor_bit_depth = 10;
   float digital_gain = 1.0f;
   TonemapMode tonemap_mode = TonemapMode::kHighQuality;
+  // The raw frame's size in pixels, as the raw stages (disparity, defective pixels, demosaic) take
+  // it: the full 4:3 frame of a 12-megapixel sensor.
+  int32_t bayer_width = 4032;
+  int32_t bayer_height = 3024;
+  // The defective-pixel correction mode of the frame; 0 switches the stage off.
+  int32_t dpc_mode = 2;
 };
 
 // A frame as the translators see it: its blocks by position in the block list, and its facts.
@@ -76,6 +82,10 @@ struct TranslatorForm {
   // Makes the Input from `frame` and translates into `records` (one pointer per record, each to
   // storage of that record's type).
   Status (*translate)(const TranslatorFrame& frame, void* const* records) = nullptr;
+  // Whether a tuning it refuses leaves the records as they were. False for the few forms whose
+  // stage takes the frame's fields (pixel order, geometry) before the tuning is read: see
+  // WritesFrameFieldsFirst.
+  bool keeps_records_on_refusal = true;
 
   // The function's name alone, which is also the name of its trace: "TranslateBlc".
   constexpr std::string_view function_name() const { return name.substr(0, name.find(' ')); }
@@ -107,6 +117,14 @@ constexpr TranslatorForm MakeTranslatorForm(std::string_view name, Call) {
                           return translator_table_internal::CallWithRecords<Call, Records...>(
                               frame, records, std::index_sequence_for<Records...>());
                         }};
+}
+
+// `form`, for a translator that writes the frame's fields (pixel order, geometry) before it reads
+// its tuning, so that a refused tuning leaves those fields written:
+//   constexpr TranslatorForm kFooIpp = WritesFrameFieldsFirst(MakeTranslatorForm<...>(...));
+constexpr TranslatorForm WritesFrameFieldsFirst(TranslatorForm form) {
+  form.keeps_records_on_refusal = false;
+  return form;
 }
 
 // Every form of the family, in the blocks' position order.

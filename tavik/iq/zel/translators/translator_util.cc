@@ -4,13 +4,17 @@
 
 namespace tavik {
 
-int64_t ToFixedPoint(float value, int fractional_bits, int64_t min, int64_t max) {
-  const float scaled = RoundHalfAwayFromZero(value * std::ldexp(1.0f, fractional_bits));
+int64_t RoundAndLimit(float value, int64_t min, int64_t max) {
+  const float rounded = RoundHalfAwayFromZero(value);
   // Compared as floats first, so that a value beyond int64's range never reaches a conversion.
-  if (!(scaled > static_cast<float>(min))) return min;
-  if (!(scaled < static_cast<float>(max))) return max;
-  const int64_t code = static_cast<int64_t>(scaled);
+  if (!(rounded > static_cast<float>(min))) return min;
+  if (!(rounded < static_cast<float>(max))) return max;
+  const int64_t code = static_cast<int64_t>(rounded);
   return code < min ? min : code > max ? max : code;
+}
+
+int64_t ToFixedPoint(float value, int fractional_bits, int64_t min, int64_t max) {
+  return RoundAndLimit(value * std::ldexp(1.0f, fractional_bits), min, max);
 }
 
 int64_t TruncateWrapping(double value) {

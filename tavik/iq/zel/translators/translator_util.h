@@ -8,10 +8,10 @@
 // It opens PerfTrace(kTranslatorTraceCategory, "<its name>"), reads its message with
 // RequireTuning<T>(block), checks it (RequireDynamic, RequireStatic, RequireSize, each taking the
 // unit's own text where it has one, in the unit's own order), writes the bypass or enable bit,
-// then converts each field with ToFixedPoint (or the documented exception) and stores it with
-// TAVIK_SET_FIELD, which masks to the field's own width. Records are written field by field, so
-// bits the caller set elsewhere survive. The normal path allocates nothing; texts are built only
-// on failure.
+// then converts each field with ToFixedPoint or ToScaledCode (or the documented exception) and
+// stores it with TAVIK_SET_FIELD, which masks to the field's own width. Records are written field
+// by field, so bits the caller set elsewhere survive. The normal path allocates nothing; texts are
+// built only on failure.
 #ifndef TAVIK_IQ_ZEL_TRANSLATORS_TRANSLATOR_UTIL_H_
 #define TAVIK_IQ_ZEL_TRANSLATORS_TRANSLATOR_UTIL_H_
 
@@ -126,9 +126,25 @@ Status GetDefault(std::string_view trace_name, void (*set_default_tuning)(Tuning
 // Rounds half away from zero (2.5 -> 3, -2.5 -> -3).
 inline float RoundHalfAwayFromZero(float value) { return std::round(value); }
 
+// `value` rounded half away from zero and limited to [min, max]; NaN gives `min`. The one
+// rounding of every code: ToFixedPoint and ToScaledCode below are this, and a field whose formula
+// is more than a product (an offset added, a quotient, a logarithm) computes its value in single
+// precision, in the formula's own order, and hands it here.
+TAVIK_EXPORT int64_t RoundAndLimit(float value, int64_t min, int64_t max);
+
 // The fixed-point code of `value` with `fractional_bits` fractional bits: value * 2^n in single
 // precision, rounded half away from zero, limited to [min, max]. NaN gives `min`.
 TAVIK_EXPORT int64_t ToFixedPoint(float value, int fractional_bits, int64_t min, int64_t max);
+
+// The code of `value` on a full scale of `scale` that is not a power of two (a 12-bit threshold
+// of scale 4095, a weight of scale 127): value * scale in single precision, rounded half away
+// from zero, limited to [min, max], or to [0, scale] in the short form. NaN gives the lower limit.
+inline int64_t ToScaledCode(float value, int64_t scale, int64_t min, int64_t max) {
+  return RoundAndLimit(value * static_cast<float>(scale), min, max);
+}
+inline int64_t ToScaledCode(float value, int64_t scale) {
+  return ToScaledCode(value, scale, 0, scale);
+}
 
 // The low `width` bits of `value`, two's complement for negative values.
 constexpr uint64_t LowBits(int64_t value, int width) {

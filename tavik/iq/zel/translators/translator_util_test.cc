@@ -56,6 +56,31 @@ TEST(ToFixedPointTest, ExtremesNeverOverflowTheConversion) {
   EXPECT_EQ(ToFixedPoint(3e38f, 20, 0, 1), 1);
 }
 
+TEST(RoundAndLimitTest, RoundsHalfAwayFromZeroThenLimits) {
+  EXPECT_EQ(RoundAndLimit(2.5f, -100, 100), 3);
+  EXPECT_EQ(RoundAndLimit(-2.5f, -100, 100), -3);
+  EXPECT_EQ(RoundAndLimit(101.0f, -100, 100), 100);
+  EXPECT_EQ(RoundAndLimit(-101.0f, -100, 100), -100);
+  EXPECT_EQ(RoundAndLimit(std::nanf(""), 2, 9), 2);
+  EXPECT_EQ(RoundAndLimit(-std::numeric_limits<float>::infinity(), -5, 5), -5);
+}
+
+TEST(ToScaledCodeTest, MultipliesByTheScaleInSinglePrecisionThenRounds) {
+  // 0.062515f * 4095 = 255.99892 and 0.046875f * 4095 = 191.953125 in single precision.
+  EXPECT_EQ(ToScaledCode(0.062515f, 4095), 256);
+  EXPECT_EQ(ToScaledCode(0.046875f, 4095), 192);
+}
+
+TEST(ToScaledCodeTest, ShortFormLimitsToZeroAndTheScale) {
+  EXPECT_EQ(ToScaledCode(1.0f, 4095), 4095);
+  EXPECT_EQ(ToScaledCode(1.5f, 4095), 4095);
+  EXPECT_EQ(ToScaledCode(-0.25f, 255), 0);
+  EXPECT_EQ(ToScaledCode(std::nanf(""), 255), 0);
+  EXPECT_EQ(ToScaledCode(2.0f, 1023, -1023, 1023), 1023);
+  // -511.5: half away from zero.
+  EXPECT_EQ(ToScaledCode(-0.5f, 1023, -1023, 1023), -512);
+}
+
 TEST(LowBitsTest, MasksTwosComplement) {
   EXPECT_EQ(LowBits(-1024, 15), 31744u);
   EXPECT_EQ(LowBits(0x12345, 16), 0x2345u);
