@@ -7,6 +7,11 @@
 #include "tavik/iq/zel/translators/blc_online_translator.h"
 #include "tavik/iq/zel/translators/dg_online_translator.h"
 #include "tavik/iq/zel/translators/gamma_online_translator.h"
+#include "tavik/iq/zel/translators/hqdns_online_translator.h"
+#include "tavik/iq/zel/translators/nfltr_online_translator.h"
+#include "tavik/iq/zel/translators/nsmix_online_translator.h"
+#include "tavik/iq/zel/translators/sharp_online_translator.h"
+#include "tavik/iq/zel/translators/snadd_online_translator.h"
 
 namespace tavik {
 namespace {
@@ -16,6 +21,10 @@ constexpr const TranslatorForm* kTable[] = {
     &translator_forms::kBlcIpp,       &translator_forms::kBlcG3aaOffsets,
     &translator_forms::kBlcG3aaGains, &translator_forms::kDg,
     &translator_forms::kGammaItp,     &translator_forms::kGammaG3aa,
+    &translator_forms::kHqdns,        &translator_forms::kHqdnsB0,
+    &translator_forms::kNfltr,        &translator_forms::kNsmix,
+    &translator_forms::kNsmixB0,      &translator_forms::kSharp,
+    &translator_forms::kSharpB0,      &translator_forms::kSnadd,
 };
 
 // Stands for a block that the frame does not have. No translator's type matches it, so each

@@ -5,7 +5,11 @@
 namespace tavik {
 
 int64_t ToFixedPoint(float value, int fractional_bits, int64_t min, int64_t max) {
-  const float scaled = RoundHalfAwayFromZero(value * std::ldexp(1.0f, fractional_bits));
+  return ToScaledCode(value, std::ldexp(1.0f, fractional_bits), min, max);
+}
+
+int64_t ToScaledCode(float value, float full_scale, int64_t min, int64_t max) {
+  const float scaled = RoundHalfAwayFromZero(value * full_scale);
   // Compared as floats first, so that a value beyond int64's range never reaches a conversion.
   if (!(scaled > static_cast<float>(min))) return min;
   if (!(scaled < static_cast<float>(max))) return max;

@@ -1,0 +1,1 @@
+#include "tavik/iq/zel/translators/hqdns_online_translator.h"

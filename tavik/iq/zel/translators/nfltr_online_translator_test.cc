@@ -1,0 +1,1 @@
+#include "tavik/iq/zel/translators/nfltr_online_translator.h"

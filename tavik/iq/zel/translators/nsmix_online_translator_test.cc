@@ -1,0 +1,1 @@
+#include "tavik/iq/zel/translators/nsmix_online_translator.h"

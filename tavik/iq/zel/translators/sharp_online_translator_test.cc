@@ -1,0 +1,1 @@
+#include "tavik/iq/zel/translators/sharp_online_translator.h"

@@ -1,0 +1,1 @@
+#include "tavik/iq/zel/translators/snadd_online_translator.h"
