@@ -624,6 +624,42 @@ TEST(TranslateHqdnsTest, SteppingsTranslateAlikeUnderTheirOwnTraces) {
               StatusIs(kInvalid, "Invalid resolution parameters."));
 }
 
+TEST(TranslateHqdnsTest, ExtremeValuesConvertWithoutOverflow) {
+  constexpr float kInf = std::numeric_limits<float>::infinity();
+  const float nan = std::numeric_limits<float>::quiet_NaN();
+  struct Case {
+    float value;
+    uint32_t shading;
+    uint16_t ordinate;
+    uint32_t factor;
+  };
+  for (const Case& c :
+       {Case{kInf, 131071, 4095, 63}, Case{3e38f, 131071, 4095, 63}, Case{nan, 0, 0, 0}}) {
+    SCOPED_TRACE(c.value);
+    zm::HqdnsTuning tuning = DefaultValuedTuning();
+    test::SetEveryFloat(tuning, c.value);
+    Frame frame;
+    frame.wb = {c.value, c.value, c.value, c.value};
+    HqdnsOutput output = {};
+    TAVIK_ASSERT_OK(TranslateHqdns(Block(tuning), frame.config, output));
+    EXPECT_EQ(output.shading_a[0], c.shading);
+    EXPECT_EQ(output.std_lut_y_g[0], c.ordinate);
+    EXPECT_EQ(output.std_slope_g[0], 0u);
+    EXPECT_EQ(output.std_factor_r, c.factor);
+    EXPECT_EQ(output.residual_limit_reduce_inverse, 0u);
+    EXPECT_EQ(output.return_factor_g, 0u);  // No finite integer part: wrapped to 0.
+  }
+  for (float value : {-kInf, -3e38f}) {
+    zm::HqdnsTuning tuning = DefaultValuedTuning();
+    test::SetEveryFloat(tuning, value);
+    const Frame frame;
+    HqdnsOutput output = {};
+    EXPECT_THAT(TranslateHqdns(Block(tuning), frame.config, output),
+                StatusIs(kInvalid, "residual_limit_reduce is invalid."));
+    EXPECT_EQ(output.shading_a[0], 0u);
+  }
+}
+
 TEST(TranslateHqdnsTest, SampleSetTranslatesForAMonoFrameAndWithDenoiseOff) {
   Frame frame;
   frame.config.sensor_type = vosbrine::SENSOR_TYPE_MONO;

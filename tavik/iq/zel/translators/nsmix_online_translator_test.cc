@@ -358,6 +358,21 @@ TEST(TranslateNsmixTest, ValuesOutsideTheirRangeAreLimitedAndNanIsZero) {
   EXPECT_EQ(output.edge_antihalo_extent_dark, 0u);
 }
 
+TEST(TranslateNsmixTest, ExtremeValuesConvertWithoutOverflow) {
+  constexpr float kInf = std::numeric_limits<float>::infinity();
+  for (float value : {kInf, -kInf, 3e38f, -3e38f, std::numeric_limits<float>::quiet_NaN()}) {
+    SCOPED_TRACE(value);
+    NsmixItpOutput output = {};
+    TAVIK_ASSERT_OK(TranslateNsmixB0(Block(Uniform(value)), kInput, output));
+    const bool high = value > 0;
+    EXPECT_EQ(output.wide_edge_suppress_dark_pos, high ? 1023u : 0u);
+    // The complement of a high value is low, and that of a low one high; NaN stays NaN, 0.
+    EXPECT_EQ(output.fine_noise_add_despeckle_dark, high ? 0u : value < 0 ? 2047u : 0u);
+    EXPECT_EQ(output.radial_noise_add_power, high ? 511u : 0x200u);
+    EXPECT_EQ(output.noise_gain[0], high ? 16383u : 0u);
+  }
+}
+
 TEST(TranslateNsmixTest, GeometryIsMaskedToFifteenBitsAndMonoAndLowPowerAreFlags) {
   NsmixItpOutput output = PatternFilled<NsmixItpOutput>();
   zm::NsmixTuning tuning = Uniform(0.5f);

@@ -156,6 +156,19 @@ TEST(TranslateSharpTest, PowerIsShiftedByOneInTheLow21BitsOfItsWord) {
   EXPECT_EQ(Words(output)[2] >> 31, 1u);  // The pattern's.
 }
 
+TEST(TranslateSharpTest, ExtremeValuesConvertWithoutOverflow) {
+  constexpr float kInf = std::numeric_limits<float>::infinity();
+  for (float value : {kInf, -kInf, 3e38f, -3e38f, std::numeric_limits<float>::quiet_NaN()}) {
+    SCOPED_TRACE(value);
+    SharpItpOutput output = {};
+    TAVIK_ASSERT_OK(TranslateSharp(Block(MakeTuning(value, value, value)), vosbrine::RGGB, output));
+    EXPECT_EQ(output.lc_threshold, value > 0 ? 1023u : 0u);
+    EXPECT_EQ(output.lc_power, value > 0 ? 63u : 0u);
+    // No finite suppression code: wrapped to 0.
+    EXPECT_EQ(output.lc_suppression, 0u);
+  }
+}
+
 TEST(TranslateSharpTest, SwitchesAndPixelOrder) {
   struct Case {
     vosbrine::BayerPattern pattern;

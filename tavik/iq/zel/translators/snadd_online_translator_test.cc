@@ -3,6 +3,7 @@
 #include <array>
 #include <cstdint>
 #include <cstring>
+#include <limits>
 #include <string>
 #include <utility>
 #include <vector>
@@ -341,6 +342,31 @@ TEST(TranslateSnaddTest, GrassTextureIndexIsStoredAsItsComplement) {
   TAVIK_ASSERT_OK(TranslateSnadd(frame.input, Block(tuning), output, EdgeMode::kHighQuality));
   EXPECT_EQ(output.extend_grass_map_by_texture_index, 0u);
   EXPECT_EQ(output.extend_grass_map_by_edge_index, 75u);  // The edge index is not complemented.
+}
+
+TEST(TranslateSnaddTest, ExtremeValuesConvertWithoutOverflow) {
+  constexpr float kInf = std::numeric_limits<float>::infinity();
+  constexpr int32_t kMax = std::numeric_limits<int32_t>::max();
+  // Regions reaching beyond 32 bits and the 16-bit entries keep their low bits.
+  Frame frame({Roi(kMax, kMax, kMax, kMax), Roi(-5, -5, 10, 10)});
+  for (float value : {kInf, -kInf, 3e38f, -3e38f, std::numeric_limits<float>::quiet_NaN()}) {
+    SCOPED_TRACE(value);
+    zm::SnaddTuning tuning = DefaultValuedTuning();
+    test::SetEveryFloat(tuning, value);
+    SnaddItpOutput output = {};
+    TAVIK_ASSERT_OK(TranslateSnadd(frame.input, Block(tuning), output, EdgeMode::kHighQuality));
+    const bool high = value > 0;
+    EXPECT_EQ(output.extend_skin_map_by_texture_index, high ? 255u : 0u);
+    EXPECT_EQ(output.extend_grass_map_by_texture_index, value < 0 ? 255u : 0u);
+    EXPECT_EQ(output.face_margin_grade_x[0], high ? 0xFFFFFu : 0u);
+    EXPECT_EQ(output.face_sharp_levels[0], high ? 64u : 0u);
+    EXPECT_EQ(output.face_brightness_gain_code, high ? 1024u : 0u);
+    EXPECT_EQ(output.face_region_left[0], 0xFFFFu);
+    EXPECT_EQ(output.face_region_right[0], 0xFFFEu);  // 2^32 - 2, low 16 bits.
+    EXPECT_EQ(output.face_region_left[1], 0xFFFBu);   // -5.
+    EXPECT_LE(output.face_margin_right[0], 4032u);
+    EXPECT_LE(output.face_margin_bottom[1], 3024u);
+  }
 }
 
 TEST(TranslateSnaddTest, BitsOutsideTheFieldsSurviveAndFixedBitsAreOredIn) {
