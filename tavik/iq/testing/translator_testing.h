@@ -14,6 +14,8 @@
 #include <vector>
 
 #include "google/protobuf/any.pb.h"
+#include "google/protobuf/descriptor.h"
+#include "google/protobuf/message.h"
 #include "gtest/gtest.h"
 #include "tavik/base/trace.h"
 #include "tavik/base/tuning_block.h"
@@ -36,6 +38,29 @@ class ForeignBlock : public TuningBlock {
  private:
   std::string name_ = "Foreign";
 };
+
+// Sets every float of `message` to `value`: its singular float fields, every element of its
+// repeated float fields (their lengths stay), and likewise in every sub-message that is set. For
+// tests of extreme values (infinities, NaN, huge magnitudes) in every field of a tuning.
+inline void SetEveryFloat(google::protobuf::Message& message, float value) {
+  const google::protobuf::Descriptor& descriptor = *message.GetDescriptor();
+  const google::protobuf::Reflection& reflection = *message.GetReflection();
+  for (int i = 0; i < descriptor.field_count(); ++i) {
+    const google::protobuf::FieldDescriptor* field = descriptor.field(i);
+    if (field->cpp_type() == google::protobuf::FieldDescriptor::CPPTYPE_FLOAT) {
+      if (!field->is_repeated()) {
+        reflection.SetFloat(&message, field, value);
+      } else {
+        for (int k = 0; k < reflection.FieldSize(message, field); ++k) {
+          reflection.SetRepeatedFloat(&message, field, k, value);
+        }
+      }
+    } else if (field->cpp_type() == google::protobuf::FieldDescriptor::CPPTYPE_MESSAGE &&
+               !field->is_repeated() && reflection.HasField(message, field)) {
+      SetEveryFloat(*reflection.MutableMessage(&message, field), value);
+    }
+  }
+}
 
 // A record whose every byte is `byte`, so that a test sees which bits a translator wrote.
 template <typename Record>

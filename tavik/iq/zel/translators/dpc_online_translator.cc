@@ -201,17 +201,28 @@ Status GetDefaultDpc(DpcConfigValue* output) {
 
 namespace translator_forms {
 
-// Both stages take the frame's pixel order (and the IPP stage its geometry) before the tuning.
+// Both stages take the frame's pixel order (and the IPP stage its geometry and sensor mode)
+// before the tuning.
+constexpr std::string_view kIppFrameFields[] = {
+    "pixel_order",    "order_bit4",     "order_bit8",     "order_bit12",   "geometry_bit0",
+    "bayer_width_a",  "bayer_height_a", "geometry_mode",  "geometry_low",  "bayer_width_b",
+    "bayer_height_b", "geometry_bit16", "geometry_bit20", "sensor_mode"};
+constexpr std::string_view kG3aaFrameFields[] = {"pixel_order"};
+
 constexpr TranslatorForm kDpcIpp =
-    WritesFrameFieldsFirst(MakeTranslatorForm<zm::DpcTuning, DpcIppOutput>(
-        "TranslateDpc (IPP)", [](const TranslatorFrame& frame, DpcIppOutput& output) {
+    MakeTranslatorForm<zm::DpcTuning, DpcIppOutput>(
+        "TranslateDpc (IPP)",
+        [](const TranslatorFrame& frame, DpcIppOutput& output) {
           return TranslateDpc(frame.Block<zm::DpcTuning>(), DpcInputOf(frame.facts), output);
-        }));
+        })
+        .WritingBeforeTuning(kIppFrameFields);
 constexpr TranslatorForm kDpcG3aa =
-    WritesFrameFieldsFirst(MakeTranslatorForm<zm::DpcTuning, DpcConfigValue>(
-        "TranslateDpc (G3AA)", [](const TranslatorFrame& frame, DpcConfigValue& output) {
+    MakeTranslatorForm<zm::DpcTuning, DpcConfigValue>(
+        "TranslateDpc (G3AA)",
+        [](const TranslatorFrame& frame, DpcConfigValue& output) {
           return TranslateDpc(frame.Block<zm::DpcTuning>(), DpcInputOf(frame.facts), &output);
-        }));
+        })
+        .WritingBeforeTuning(kG3aaFrameFields);
 
 }  // namespace translator_forms
 }  // namespace tavik

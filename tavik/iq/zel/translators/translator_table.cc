@@ -11,9 +11,14 @@
 #include "tavik/iq/zel/translators/dpc_online_translator.h"
 #include "tavik/iq/zel/translators/edgedet_online_translator.h"
 #include "tavik/iq/zel/translators/gamma_online_translator.h"
+#include "tavik/iq/zel/translators/hqdns_online_translator.h"
+#include "tavik/iq/zel/translators/nfltr_online_translator.h"
+#include "tavik/iq/zel/translators/nsmix_online_translator.h"
 #include "tavik/iq/zel/translators/prc_online_translator.h"
 #include "tavik/iq/zel/translators/sensor_gamma_online_translator.h"
+#include "tavik/iq/zel/translators/sharp_online_translator.h"
 #include "tavik/iq/zel/translators/skind_online_translator.h"
+#include "tavik/iq/zel/translators/snadd_online_translator.h"
 
 namespace tavik {
 namespace {
@@ -32,10 +37,18 @@ constexpr const TranslatorForm* kTable[] = {
     &translator_forms::kEdgedet,
     &translator_forms::kGammaItp,
     &translator_forms::kGammaG3aa,
+    &translator_forms::kHqdns,
+    &translator_forms::kHqdnsB0,
+    &translator_forms::kNfltr,
+    &translator_forms::kNsmix,
+    &translator_forms::kNsmixB0,
     &translator_forms::kPrc,
     &translator_forms::kSensorGammaProIpp,
     &translator_forms::kSensorGammaG3aa,
+    &translator_forms::kSharp,
+    &translator_forms::kSharpB0,
     &translator_forms::kSkind,
+    &translator_forms::kSnadd,
 };
 
 // Stands for a block that the frame does not have. No translator's type matches it, so each

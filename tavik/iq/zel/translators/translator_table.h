@@ -33,26 +33,38 @@
 #include "tavik/base/tuning_block.h"
 #include "tavik/iq/export.h"
 #include "tavik/iq/protos/common.pb.h"
+#include "tavik/iq/zel/translators/frame_modes.h"
 #include "tavik/iq/zel/translators/record_description.h"
 #include "tavik/iq/zel/translators/tonemap.h"
+#include "tavik/iq/zel/translators/white_balance_config.h"
 #include "tavik/iq/zel/zel_block_list.h"
 
 namespace tavik {
 
 // What a frame tells the translators besides its tuning: the facts their Input records are made
-// of. The defaults describe a plain 10-bit Bayer frame whose tone curve the tuning rules.
+// of. The defaults describe a plain 10-bit Bayer frame of 4032 x 3024 under unit white balance,
+// denoised and sharpened, with no face in view, whose tone curve the tuning rules.
 struct FrameFacts {
   vosbrine::BayerPattern bayer_pattern = vosbrine::RGGB;
   vosbrine::SensorType sensor_type = vosbrine::SENSOR_TYPE_BAYER;
   int32_t sensor_bit_depth = 10;
   float digital_gain = 1.0f;
   TonemapMode tonemap_mode = TonemapMode::kHighQuality;
-  // The raw frame's size in pixels, as the raw stages (disparity, defective pixels, demosaic) take
-  // it: the full 4:3 frame of a 12-megapixel sensor.
+  // The raw frame's size in pixels, as the raw stages (disparity, defective pixels, demosaic, the
+  // raw denoiser and noise mix) take it: the full 4:3 frame of a 12-megapixel sensor.
   int32_t bayer_width = 4032;
   int32_t bayer_height = 3024;
+  // The size in pixels of the image that the ITP stages process (after the raw stages' crop and
+  // scaling); the face regions are in its coordinates.
+  int32_t image_width = 4032;
+  int32_t image_height = 3024;
+  tavik_api::WhiteBalanceConfig white_balance;
   // The defective-pixel correction mode of the frame; 0 switches the stage off.
   int32_t dpc_mode = 2;
+  DenoiseMode denoise_mode = DenoiseMode::kHighQuality;
+  EdgeMode edge_mode = EdgeMode::kHighQuality;
+  // The faces detected in the frame, in pixels; the caller keeps them alive.
+  std::span<const vosbrine::Roi> face_regions;
 };
 
 // A frame as the translators see it: its blocks by position in the block list, and its facts.
@@ -82,13 +94,22 @@ struct TranslatorForm {
   // Makes the Input from `frame` and translates into `records` (one pointer per record, each to
   // storage of that record's type).
   Status (*translate)(const TranslatorFrame& frame, void* const* records) = nullptr;
-  // Whether a tuning it refuses leaves the records as they were. False for the few forms whose
-  // stage takes the frame's fields (pixel order, geometry) before the tuning is read: see
-  // WritesFrameFieldsFirst.
-  bool keeps_records_on_refusal = true;
+  // Fields of the records (by their described names) that the translator writes from the frame's
+  // facts before it reads the tuning, as a stage whose geometry is programmed whatever the tuning
+  // holds; a block it refuses leaves every other bit as it was. Empty for most forms.
+  std::span<const std::string_view> fields_before_tuning;
 
   // The function's name alone, which is also the name of its trace: "TranslateBlc".
   constexpr std::string_view function_name() const { return name.substr(0, name.find(' ')); }
+
+  // This form, telling the fields it writes before it reads the tuning:
+  //   constexpr std::string_view kGeometry[] = {"image_width", "image_height"};
+  //   constexpr TranslatorForm kFoo = MakeTranslatorForm<...>(...).WritingBeforeTuning(kGeometry);
+  constexpr TranslatorForm WritingBeforeTuning(std::span<const std::string_view> fields) const {
+    TranslatorForm form = *this;
+    form.fields_before_tuning = fields;
+    return form;
+  }
 };
 
 namespace translator_table_internal {
@@ -111,20 +132,14 @@ template <typename Tuning, DescribedRecord... Records, typename Call>
 constexpr TranslatorForm MakeTranslatorForm(std::string_view name, Call) {
   static_assert(std::is_empty_v<Call> && std::is_default_constructible_v<Call>,
                 "a form's call is a lambda without captures");
-  return TranslatorForm{name, kZelBlockPosition<Tuning>,
+  return TranslatorForm{name,
+                        kZelBlockPosition<Tuning>,
                         translator_table_internal::kRecordsOf<Records...>,
                         [](const TranslatorFrame& frame, void* const* records) -> Status {
                           return translator_table_internal::CallWithRecords<Call, Records...>(
                               frame, records, std::index_sequence_for<Records...>());
-                        }};
-}
-
-// `form`, for a translator that writes the frame's fields (pixel order, geometry) before it reads
-// its tuning, so that a refused tuning leaves those fields written:
-//   constexpr TranslatorForm kFooIpp = WritesFrameFieldsFirst(MakeTranslatorForm<...>(...));
-constexpr TranslatorForm WritesFrameFieldsFirst(TranslatorForm form) {
-  form.keeps_records_on_refusal = false;
-  return form;
+                        },
+                        {}};
 }
 
 // Every form of the family, in the blocks' position order.

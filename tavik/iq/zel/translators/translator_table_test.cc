@@ -3,11 +3,13 @@
 // another type, and the translation of every leaf of the sample tuning set.
 #include "tavik/iq/zel/translators/translator_table.h"
 
+#include <algorithm>
 #include <array>
 #include <cstring>
 #include <memory>
 #include <set>
 #include <string>
+#include <string_view>
 #include <utility>
 #include <vector>
 
@@ -27,6 +29,8 @@ using ::tavik::test::RecordingTraceSink;
 using ::tavik::test::ScopedLogCapture;
 using ::tavik::test::StatusIs;
 
+bool WrittenBeforeTuning(const TranslatorForm& form, std::string_view field);
+
 // Storage for a form's records filled with a pattern, as a caller's records may hold anything.
 class PatternRecords {
  public:
@@ -38,12 +42,20 @@ class PatternRecords {
     }
   }
   void* const* pointers() const { return pointers_.data(); }
-  bool Unchanged(const TranslatorForm& form) const {
+  // Every byte still holds the pattern, but for the fields the form writes before it reads the
+  // tuning, which may hold anything.
+  bool UnchangedButFieldsBeforeTuning(const TranslatorForm& form) const {
     for (size_t i = 0; i < pointers_.size(); ++i) {
-      const auto* bytes = static_cast<const unsigned char*>(pointers_[i]);
-      for (size_t b = 0; b < form.records[i]->size; ++b) {
-        if (bytes[b] != 0xA5) return false;
+      const RecordDescription& record = *form.records[i];
+      std::vector<unsigned char> expected(record.size + 16, 0xA5);
+      void* expected_record = Aligned(expected.data(), record.alignment);
+      for (const FieldDescription& field : record.fields) {
+        if (!WrittenBeforeTuning(form, field.name)) continue;
+        for (int index = 0; index < field.count; ++index) {
+          field.set(expected_record, index, field.get(pointers_[i], index));
+        }
       }
+      if (std::memcmp(expected_record, pointers_[i], record.size) != 0) return false;
     }
     return true;
   }
@@ -71,6 +83,11 @@ struct SampleFile {
     return frame;
   }
 };
+
+bool WrittenBeforeTuning(const TranslatorForm& form, std::string_view field) {
+  return std::find(form.fields_before_tuning.begin(), form.fields_before_tuning.end(), field) !=
+         form.fields_before_tuning.end();
+}
 
 std::vector<SampleFile> SampleFiles() {
   std::vector<SampleFile> files;
@@ -125,6 +142,18 @@ TEST(TranslatorTableTest, FunctionNameIsTheDisplayNameBeforeItsStage) {
   EXPECT_EQ(form.function_name(), "TranslateSkind");
 }
 
+TEST(TranslatorTableTest, WritingBeforeTuningTellsTheFieldsAndKeepsTheRestOfTheForm) {
+  static constexpr std::string_view kFields[] = {"image_width", "image_height"};
+  TranslatorForm form;
+  form.name = "TranslateFoo (IPP)";
+  form.block = 3;
+  EXPECT_TRUE(form.fields_before_tuning.empty());
+  const TranslatorForm writing = form.WritingBeforeTuning(kFields);
+  EXPECT_EQ(writing.name, "TranslateFoo (IPP)");
+  EXPECT_EQ(writing.block, 3u);
+  EXPECT_THAT(writing.fields_before_tuning, ::testing::ElementsAre("image_width", "image_height"));
+}
+
 TEST(TranslatorTableTest, AbsentBlockIsRefusedLikeAForeignOne) {
   const TranslatorFrame frame;
   EXPECT_EQ(frame.Block<vosbrine::zelmondrake::BlcTuning>().GetName(), "absent block");
@@ -164,9 +193,16 @@ TEST_P(TranslatorFormTest, BlockOfAnotherTypeGivesTheStockTextAndLeavesTheRecord
   EXPECT_THAT(form().translate(frame, records.pointers()),
               StatusIs(absl::StatusCode::kInvalidArgument, "Invalid TuningBlock!"));
   EXPECT_TRUE(log.Contains("Incorrect tuning block type: Foreign"));
-  // A form that writes the frame's fields first says so; the others write nothing.
-  if (form().keeps_records_on_refusal) {
-    EXPECT_TRUE(records.Unchanged(form()));
+  EXPECT_TRUE(records.UnchangedButFieldsBeforeTuning(form()));
+}
+
+TEST_P(TranslatorFormTest, FieldsWrittenBeforeTheTuningAreFieldsOfItsRecords) {
+  for (std::string_view name : form().fields_before_tuning) {
+    bool found = false;
+    for (const RecordDescription* record : form().records) {
+      for (const FieldDescription& field : record->fields) found = found || field.name == name;
+    }
+    EXPECT_TRUE(found) << name;
   }
 }
 

@@ -136,14 +136,15 @@ TAVIK_EXPORT int64_t RoundAndLimit(float value, int64_t min, int64_t max);
 // precision, rounded half away from zero, limited to [min, max]. NaN gives `min`.
 TAVIK_EXPORT int64_t ToFixedPoint(float value, int fractional_bits, int64_t min, int64_t max);
 
-// The code of `value` on a full scale of `scale` that is not a power of two (a 12-bit threshold
-// of scale 4095, a weight of scale 127): value * scale in single precision, rounded half away
-// from zero, limited to [min, max], or to [0, scale] in the short form. NaN gives the lower limit.
-inline int64_t ToScaledCode(float value, int64_t scale, int64_t min, int64_t max) {
-  return RoundAndLimit(value * static_cast<float>(scale), min, max);
+// The code of `value` on a full scale that is not a power of two (a 12-bit threshold of scale
+// 4095, a weight of scale 127, 0..1 onto 0..1023): value * full_scale in single precision,
+// rounded half away from zero, limited to [min, max], or to [0, full_scale] in the short form.
+// NaN gives the lower limit.
+inline int64_t ToScaledCode(float value, float full_scale, int64_t min, int64_t max) {
+  return RoundAndLimit(value * full_scale, min, max);
 }
-inline int64_t ToScaledCode(float value, int64_t scale) {
-  return ToScaledCode(value, scale, 0, scale);
+inline int64_t ToScaledCode(float value, int64_t full_scale) {
+  return ToScaledCode(value, static_cast<float>(full_scale), 0, full_scale);
 }
 
 // The low `width` bits of `value`, two's complement for negative values.
@@ -159,6 +160,25 @@ TAVIK_EXPORT int64_t TruncateWrapping(double value);
 // `value` truncated toward zero and limited to [0, 2^32 - 1], NaN giving 0: the saturating
 // float-to-unsigned conversion of the device's CPU, for fields truncated to an unsigned integer.
 TAVIK_EXPORT uint32_t TruncateToUint32(double value);
+
+// `value` rounded half away from zero, then wrapped as TruncateWrapping does: for fields that are
+// rounded and then masked to their width rather than clamped.
+inline int64_t RoundWrapping(float value) { return TruncateWrapping(RoundHalfAwayFromZero(value)); }
+
+// `entry` with its low `width` bits replaced by those of `code`: a table entry narrower than its
+// element type is written so that the element's spare bits survive, as a bit-field would.
+template <typename Entry>
+constexpr Entry WithLowBits(Entry entry, int width, uint64_t code) {
+  const uint64_t mask = LowBits(-1, width);
+  return static_cast<Entry>((static_cast<uint64_t>(entry) & ~mask) | (code & mask));
+}
+
+// A constant of a fixed record, told as a keep mask and a value that is or-ed in: the bits of
+// `keep` stay as the caller left them, the others are cleared, then `value` is or-ed in (a value
+// may set kept bits: a keep mask of all ones ors a flag into whatever was there).
+constexpr void WriteFixedBits(uint32_t& word, uint32_t keep, uint32_t value) {
+  word = (word & keep) | value;
+}
 
 // Where a sample falls in a rising knot table: between knots `upper` - 1 and `upper`, with the
 // weight of the lower knot (below 0 or above 1 beyond the table's ends). `rises` is false when

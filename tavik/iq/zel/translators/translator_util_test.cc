@@ -1,6 +1,7 @@
 #include "tavik/iq/zel/translators/translator_util.h"
 
 #include <cmath>
+#include <cstdint>
 #include <limits>
 
 #include "gtest/gtest.h"
@@ -79,6 +80,46 @@ TEST(ToScaledCodeTest, ShortFormLimitsToZeroAndTheScale) {
   EXPECT_EQ(ToScaledCode(2.0f, 1023, -1023, 1023), 1023);
   // -511.5: half away from zero.
   EXPECT_EQ(ToScaledCode(-0.5f, 1023, -1023, 1023), -512);
+}
+
+TEST(ToScaledCodeTest, RoundsTheScaledValueHalfAwayFromZeroThenLimits) {
+  EXPECT_EQ(ToScaledCode(0.5f, 1023.0f, 0, 1023), 512);   // 511.5.
+  EXPECT_EQ(ToScaledCode(0.25f, 1023.0f, 0, 1023), 256);  // 255.75.
+  EXPECT_EQ(ToScaledCode(-0.5f, 1.0f, -100, 100), -1);
+  EXPECT_EQ(ToScaledCode(1.5f, 1023.0f, 0, 1023), 1023);
+  EXPECT_EQ(ToScaledCode(-1.0f, 255.0f, 0, 255), 0);
+  EXPECT_EQ(ToScaledCode(std::nanf(""), 255.0f, 3, 255), 3);
+  EXPECT_EQ(ToScaledCode(std::numeric_limits<float>::infinity(), 255.0f, 0, 255), 255);
+  // The same rounding as ToFixedPoint for a power of two.
+  EXPECT_EQ(ToScaledCode(0.1f, 1024.0f, 0, 4095), ToFixedPoint(0.1f, 10, 0, 4095));
+}
+
+TEST(RoundWrappingTest, RoundsThenWrapsAnyFloat) {
+  EXPECT_EQ(RoundWrapping(16.5f), 17);
+  EXPECT_EQ(RoundWrapping(-2.5f), -3);
+  EXPECT_EQ(LowBits(RoundWrapping(17.0f), 4), 1u);
+  EXPECT_EQ(RoundWrapping(std::nanf("")), 0);
+  EXPECT_EQ(RoundWrapping(std::numeric_limits<float>::infinity()), 0);
+  EXPECT_EQ(RoundWrapping(1e30f) & 0xFFFF, 0);
+}
+
+TEST(WithLowBitsTest, ReplacesTheLowBitsAndKeepsTheRest) {
+  EXPECT_EQ(WithLowBits(uint16_t{0xA5A5}, 14, 0x3FFF), 0xBFFF);
+  EXPECT_EQ(WithLowBits(uint16_t{0xA5A5}, 14, 0x12345), 0xA345);
+  EXPECT_EQ(WithLowBits(uint32_t{0xA5A5A5A5}, 17, 40000), 0xA5A49C40u);
+  EXPECT_EQ(WithLowBits(uint32_t{0xFFFFFFFF}, 32, 5), 5u);
+}
+
+TEST(WriteFixedBitsTest, KeepsTheKeptBitsClearsTheOthersAndOrsTheValue) {
+  uint32_t word = 0xA5A5A5A5;
+  WriteFixedBits(word, 0xFFFFC008, 0x511);
+  EXPECT_EQ(word, 0xA5A58511u);
+  WriteFixedBits(word, 0, 0xBBBBBBBB);
+  EXPECT_EQ(word, 0xBBBBBBBBu);
+  // A keep mask of all ones ors a flag into what was there.
+  word = 0xA5A5A5A4;
+  WriteFixedBits(word, ~uint32_t{0}, 0xF);
+  EXPECT_EQ(word, 0xA5A5A5AFu);
 }
 
 TEST(LowBitsTest, MasksTwosComplement) {
