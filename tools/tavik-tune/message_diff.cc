@@ -1,6 +1,7 @@
 #include "tools/tavik-tune/message_diff.h"
 
 #include <charconv>
+#include <cstdio>
 #include <cmath>
 #include <cstring>
 
@@ -20,6 +21,14 @@ std::string ShortestText(T value) {
   char text[64];
   const auto result = std::to_chars(text, text + sizeof(text), value);
   return std::string(text, result.ptr);
+}
+
+// A difference of two values is read for its size: six significant digits are plenty, and
+// spare it the digits of the subtraction's rounding.
+std::string SixDigits(double value) {
+  char text[32];
+  std::snprintf(text, sizeof(text), "%.6g", value);
+  return text;
 }
 
 template <typename T>
@@ -191,7 +200,7 @@ class Differ {
     }
     std::string summary = StrCat(elements.size(), " of ", size_a, " values changed");
     if (largest_at >= 0) {
-      StrAppend(&summary, ", the largest by ", ShortestText(largest), " at [", largest_at, "]: ",
+      StrAppend(&summary, ", the largest by ", SixDigits(largest), " at [", largest_at, "]: ",
                 ReadScalar(a, field, largest_at).text, " -> ",
                 ReadScalar(b, field, largest_at).text);
     }
