@@ -72,11 +72,10 @@ Status ReadFile(const std::string& file, Side& side) {
   TuningFile tuning{file, {}, {}};
   if (Status status = ReadBinaryProto(file, tuning.data); !status.ok()) return status;
   if (!tuning.data.tuning_tree_set().UnpackTo(&tuning.tree_set)) {
-    return InvalidArgumentError(
-        StrCat(file, ": tuning_tree_set does not unpack as ", TuningTreeSet::descriptor()->full_name()));
+    return InvalidArgumentError(StrCat(file, ": tuning_tree_set does not unpack as ",
+                                       TuningTreeSet::descriptor()->full_name()));
   }
-  side.tunings.emplace(vosbrine::EncodeUsecaseKey(tuning.data.tuning_usecase()),
-                       std::move(tuning));
+  side.tunings.emplace(vosbrine::EncodeUsecaseKey(tuning.data.tuning_usecase()), std::move(tuning));
   return OkStatus();
 }
 
@@ -117,8 +116,8 @@ class TreeDiffer {
     }
     ComparePacked(a.static_param(), b.static_param(), block_.static_param, "static_param");
     if (a.has_dynamic_top_level() != b.has_dynamic_top_level()) {
-      Report(kNone, a.has_dynamic_top_level() ? "dynamic_top_level removed"
-                                              : "dynamic_top_level added");
+      Report(kNone,
+             a.has_dynamic_top_level() ? "dynamic_top_level removed" : "dynamic_top_level added");
       return;
     }
     CompareLevels(a.dynamic_top_level(), b.dynamic_top_level(), "");
@@ -218,9 +217,9 @@ class TreeDiffer {
 void CompareTunings(const std::string& where, const TuningFile& a, const TuningFile& b,
                     const MessageDiffOptions& options, std::vector<DiffFinding>* findings) {
   if (a.data.version() != b.data.version()) {
-    findings->push_back({where, kNone, kNone,
-                         StrCat("version: \"", a.data.version(), "\" -> \"", b.data.version(),
-                                "\"")});
+    findings->push_back(
+        {where, kNone, kNone,
+         StrCat("version: \"", a.data.version(), "\" -> \"", b.data.version(), "\"")});
   }
   const auto* reflection = a.tree_set.GetReflection();
   for (const BlockType& block : AllBlockTypes()) {
@@ -233,8 +232,9 @@ void CompareTunings(const std::string& where, const TuningFile& a, const TuningF
       continue;
     }
     TreeDiffer(where, block, options, findings)
-        .Compare(static_cast<const TuningTree&>(reflection->GetMessage(a.tree_set, block.tree_field)),
-                 static_cast<const TuningTree&>(reflection->GetMessage(b.tree_set, block.tree_field)));
+        .Compare(
+            static_cast<const TuningTree&>(reflection->GetMessage(a.tree_set, block.tree_field)),
+            static_cast<const TuningTree&>(reflection->GetMessage(b.tree_set, block.tree_field)));
   }
 }
 
@@ -255,9 +255,9 @@ void CompareGoldens(const std::string& where, const GoldenFile& a, const GoldenF
   }
   if (!old_any.UnpackTo(&old_data) || !new_any.UnpackTo(&new_data)) {
     if (old_any.value() != new_any.value()) {
-      findings->push_back({where, kNone, "calibration_data",
-                           StrCat("bytes differ, and do not parse as ",
-                                  old_data.GetDescriptor()->full_name())});
+      findings->push_back(
+          {where, kNone, "calibration_data",
+           StrCat("bytes differ, and do not parse as ", old_data.GetDescriptor()->full_name())});
     }
     return;
   }
@@ -269,17 +269,18 @@ void CompareGoldens(const std::string& where, const GoldenFile& a, const GoldenF
 // Entries of two maps by key: compared where both have one, reported where one side has none.
 template <typename File, typename CompareFn>
 void CompareByKey(const std::map<std::string, File>& a, const std::map<std::string, File>& b,
-                  const std::string& prefix, CompareFn compare, std::vector<DiffFinding>* findings) {
+                  const std::string& prefix, CompareFn compare,
+                  std::vector<DiffFinding>* findings) {
   auto it_a = a.begin();
   auto it_b = b.begin();
   while (it_a != a.end() || it_b != b.end()) {
     if (it_b == b.end() || (it_a != a.end() && it_a->first < it_b->first)) {
-      findings->push_back({prefix + it_a->first, kNone, kNone,
-                           StrCat("removed (was ", it_a->second.path, ")")});
+      findings->push_back(
+          {prefix + it_a->first, kNone, kNone, StrCat("removed (was ", it_a->second.path, ")")});
       ++it_a;
     } else if (it_a == a.end() || it_b->first < it_a->first) {
-      findings->push_back({prefix + it_b->first, kNone, kNone,
-                           StrCat("added (in ", it_b->second.path, ")")});
+      findings->push_back(
+          {prefix + it_b->first, kNone, kNone, StrCat("added (in ", it_b->second.path, ")")});
       ++it_b;
     } else {
       compare(prefix + it_a->first, it_a->second, it_b->second);

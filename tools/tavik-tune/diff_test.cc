@@ -172,8 +172,7 @@ TEST_F(DiffDirectoryTest, FileAgainstADirectoryMatchesByKey) {
 }
 
 TEST(DiffSampleSetTest, SampleTuningSetAgainstItselfHasNoDifference) {
-  EXPECT_THAT(DiffPaths(TAVIK_SAMPLE_TUNING_DIR, TAVIK_SAMPLE_TUNING_DIR),
-              IsOkAndHolds(IsEmpty()));
+  EXPECT_THAT(DiffPaths(TAVIK_SAMPLE_TUNING_DIR, TAVIK_SAMPLE_TUNING_DIR), IsOkAndHolds(IsEmpty()));
 }
 
 TEST(DiffFailureTest, FilesThatCantBeRead) {

@@ -104,9 +104,9 @@ StatusOr<FieldPath> FieldPath::Parse(const Descriptor* block, std::string_view t
       }
     }
     if (field == nullptr) {
-      return InvalidArgumentError(StrCat("no field '", part->name, "' in ",
-                                         i == 0 ? StrCat(block->name(), " or its dynamic_param")
-                                                : type->name()));
+      return InvalidArgumentError(
+          StrCat("no field '", part->name, "' in ",
+                 i == 0 ? StrCat(block->name(), " or its dynamic_param") : type->name()));
     }
     if (part->index != kWhole && !field->is_repeated()) {
       return InvalidArgumentError(StrCat("'", part->name, "' is not repeated: drop the index"));
@@ -138,8 +138,8 @@ StatusOr<std::vector<double>> FieldPath::Read(const Message& block) const {
     const Reflection& reflection = *message->GetReflection();
     const int size = step.field->is_repeated() ? reflection.FieldSize(*message, step.field) : 1;
     if (step.index != kWhole && step.index >= size) {
-      return OutOfRangeError(StrCat(step.field->name(), "[", step.index, "] is past the end of ",
-                                    size, " values"));
+      return OutOfRangeError(
+          StrCat(step.field->name(), "[", step.index, "] is past the end of ", size, " values"));
     }
     if (step.field->cpp_type() != FieldDescriptor::CPPTYPE_MESSAGE) {
       if (step.index != kWhole || !step.field->is_repeated()) {

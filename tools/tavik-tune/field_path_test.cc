@@ -81,18 +81,18 @@ TEST(FieldPathTest, BadPathsAreExplained) {
   const auto* wb = vosbrine::zelmondrake::WbTuning::descriptor();
   const auto* lsc = vosbrine::zelmondrake::LscTuning::descriptor();
   const auto* clut = vosbrine::zelmondrake::ClutTuning::descriptor();
-  EXPECT_THAT(FieldPath::Parse(wb, "gains"),
-              StatusIs(StatusCode::kInvalidArgument,
-                       "no field 'gains' in WbTuning or its dynamic_param"));
+  EXPECT_THAT(
+      FieldPath::Parse(wb, "gains"),
+      StatusIs(StatusCode::kInvalidArgument, "no field 'gains' in WbTuning or its dynamic_param"));
   EXPECT_THAT(FieldPath::Parse(lsc, "lsc_tables.gain"),
               StatusIs(StatusCode::kInvalidArgument, "no field 'gain' in LscTables"));
   EXPECT_THAT(FieldPath::Parse(wb, "enable[0]"),
               StatusIs(StatusCode::kInvalidArgument, "'enable' is not repeated: drop the index"));
   EXPECT_THAT(FieldPath::Parse(wb, "enable.x"),
               StatusIs(StatusCode::kInvalidArgument, "'enable' has no fields"));
-  EXPECT_THAT(FieldPath::Parse(lsc, "lsc_tables"),
-              StatusIs(StatusCode::kInvalidArgument,
-                       "'lsc_tables' is a message: name one of its fields"));
+  EXPECT_THAT(
+      FieldPath::Parse(lsc, "lsc_tables"),
+      StatusIs(StatusCode::kInvalidArgument, "'lsc_tables' is a message: name one of its fields"));
   EXPECT_THAT(FieldPath::Parse(clut, "static_param.input_lut.lut"),
               StatusIs(StatusCode::kInvalidArgument,
                        "'input_lut' is a list of messages: pick one, input_lut[0]"));
@@ -103,9 +103,9 @@ TEST(FieldPathTest, BadPathsAreExplained) {
               StatusIs(StatusCode::kInvalidArgument,
                        "bad element 'wb_gains[-1]' in field path 'wb_gains[-1]': write "
                        "name[index]"));
-  EXPECT_THAT(FieldPath::Parse(wb, "static_param..enable"),
-              StatusIs(StatusCode::kInvalidArgument,
-                       "empty name in field path 'static_param..enable'"));
+  EXPECT_THAT(
+      FieldPath::Parse(wb, "static_param..enable"),
+      StatusIs(StatusCode::kInvalidArgument, "empty name in field path 'static_param..enable'"));
   EXPECT_THAT(FieldPath::Parse(wb, ""),
               StatusIs(StatusCode::kInvalidArgument, "empty name in field path ''"));
 }

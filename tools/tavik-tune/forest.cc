@@ -31,8 +31,7 @@ StatusOr<std::unique_ptr<vosbrine::zelmondrake::TuningProvider>> LoadForest(
 
 std::string ResolvedUsecaseKey(const vosbrine::zelmondrake::TuningProvider& provider,
                                const vosbrine::TuningUsecase& usecase) {
-  const google::protobuf::Message* tree_set =
-      provider.GetTuningTreeSet(usecase, /*fallback=*/true);
+  const google::protobuf::Message* tree_set = provider.GetTuningTreeSet(usecase, /*fallback=*/true);
   for (const auto& [key, message] : provider.forest()) {
     if (message.get() == tree_set) return key;
   }

@@ -1,8 +1,8 @@
 #include "tools/tavik-tune/message_diff.h"
 
 #include <charconv>
-#include <cstdio>
 #include <cmath>
+#include <cstdio>
 #include <cstring>
 
 #include "absl/strings/escaping.h"
@@ -49,7 +49,8 @@ Scalar ReadScalar(const Message& message, const FieldDescriptor& field, int inde
   const bool repeated = index >= 0;
   switch (field.cpp_type()) {
     case FieldDescriptor::CPPTYPE_FLOAT: {
-      const float v = repeated ? r.GetRepeatedFloat(message, &field, index) : r.GetFloat(message, &field);
+      const float v =
+          repeated ? r.GetRepeatedFloat(message, &field, index) : r.GetFloat(message, &field);
       return {FormatFloat(v), v, true};
     }
     case FieldDescriptor::CPPTYPE_DOUBLE: {
@@ -78,11 +79,13 @@ Scalar ReadScalar(const Message& message, const FieldDescriptor& field, int inde
       return {StrCat(v), static_cast<double>(v), true};
     }
     case FieldDescriptor::CPPTYPE_BOOL: {
-      const bool v = repeated ? r.GetRepeatedBool(message, &field, index) : r.GetBool(message, &field);
+      const bool v =
+          repeated ? r.GetRepeatedBool(message, &field, index) : r.GetBool(message, &field);
       return {v ? "true" : "false"};
     }
     case FieldDescriptor::CPPTYPE_ENUM: {
-      const auto* v = repeated ? r.GetRepeatedEnum(message, &field, index) : r.GetEnum(message, &field);
+      const auto* v =
+          repeated ? r.GetRepeatedEnum(message, &field, index) : r.GetEnum(message, &field);
       const int number = repeated ? r.GetRepeatedEnumValue(message, &field, index)
                                   : r.GetEnumValue(message, &field);
       // An open enum may hold a number it has no name for.
@@ -166,8 +169,8 @@ class Differ {
                 b.GetReflection()->GetRepeatedMessage(b, &field, i), StrCat(path, "[", i, "]"));
       }
       if (size_a != size_b) {
-        changes_->push_back({path, Count(size_a, "entry", "entries"),
-                             Count(size_b, "entry", "entries"), ""});
+        changes_->push_back(
+            {path, Count(size_a, "entry", "entries"), Count(size_b, "entry", "entries"), ""});
       }
       return;
     }
@@ -200,8 +203,8 @@ class Differ {
     }
     std::string summary = StrCat(elements.size(), " of ", size_a, " values changed");
     if (largest_at >= 0) {
-      StrAppend(&summary, ", the largest by ", SixDigits(largest), " at [", largest_at, "]: ",
-                ReadScalar(a, field, largest_at).text, " -> ",
+      StrAppend(&summary, ", the largest by ", SixDigits(largest), " at [", largest_at,
+                "]: ", ReadScalar(a, field, largest_at).text, " -> ",
                 ReadScalar(b, field, largest_at).text);
     }
     changes_->push_back({path, "", "", std::move(summary)});

@@ -84,10 +84,10 @@ TEST(MessageDiffTest, ScalarsOfEveryKind) {
   EXPECT_THAT(Lines(Parse<vosbrine::zelmondrake::LscStaticParam>("enable_vorel: false"),
                     Parse<vosbrine::zelmondrake::LscStaticParam>("enable_vorel: true")),
               ElementsAre("enable_vorel: false -> true"));
-  EXPECT_THAT(Lines(vosbrine::zelmondrake::LtmDeltaYStaticParam(),
-                    Parse<vosbrine::zelmondrake::LtmDeltaYStaticParam>(
-                        "post_ltm_curve: GAMMA22_CURVE")),
-              ElementsAre("post_ltm_curve: POSTLTMCURVE_UNSPECIFIED -> GAMMA22_CURVE"));
+  EXPECT_THAT(
+      Lines(vosbrine::zelmondrake::LtmDeltaYStaticParam(),
+            Parse<vosbrine::zelmondrake::LtmDeltaYStaticParam>("post_ltm_curve: GAMMA22_CURVE")),
+      ElementsAre("post_ltm_curve: POSTLTMCURVE_UNSPECIFIED -> GAMMA22_CURVE"));
 }
 
 TEST(MessageDiffTest, NumbersCompareByTheirBits) {

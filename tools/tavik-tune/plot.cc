@@ -145,10 +145,9 @@ void CollectRegions(const Level& level, const Coordinate& swept, const LevelCoor
   const Coordinate* coordinate = CoordinateOfLevel(level.type());
   if (coordinate == nullptr) return;  // Evaluation fails there; the sweep will say so.
   const float x = GetCoordinate(at, *coordinate);
-  auto reaching = std::lower_bound(nodes.begin(), nodes.end(), x,
-                                   [](const vosbrine::Node& node, float value) {
-                                     return node.upper() < value;
-                                   });
+  auto reaching = std::lower_bound(
+      nodes.begin(), nodes.end(), x,
+      [](const vosbrine::Node& node, float value) { return node.upper() < value; });
   if (reaching == nodes.end()) --reaching;
   const int i = static_cast<int>(reaching - nodes.begin());
   const bool single_region = nodes[i].lower() <= x || i == 0;
@@ -160,8 +159,11 @@ void CollectRegions(const Level& level, const Coordinate& swept, const LevelCoor
 // Even steps over the range, and the region edges inside it, where the value bends.
 std::vector<double> SweepPositions(double from, double to, int samples,
                                    const std::vector<Region>& regions) {
+  // Coordinates are floats in the camera state: each position is the value evaluated.
   std::vector<double> positions;
-  for (int i = 0; i < samples; ++i) positions.push_back(from + (to - from) * i / (samples - 1));
+  for (int i = 0; i < samples; ++i) {
+    positions.push_back(static_cast<float>(from + (to - from) * i / (samples - 1)));
+  }
   for (const Region& region : regions) {
     for (double edge : {region.lower, region.upper}) {
       if (edge >= from && edge <= to) positions.push_back(edge);
@@ -175,7 +177,8 @@ std::vector<double> SweepPositions(double from, double to, int samples,
 StatusOr<Figure> MakeSweepFigure(const vosbrine::zelmondrake::TuningProvider& provider,
                                  const PlotRequest& request) {
   const Coordinate* swept = FindCoordinate(request.along);
-  if (swept == nullptr) return InvalidArgumentError(StrCat("unknown coordinate '", request.along, "'"));
+  if (swept == nullptr)
+    return InvalidArgumentError(StrCat("unknown coordinate '", request.along, "'"));
   std::vector<FieldPath> paths;
   for (const std::string& field : request.fields) {
     StatusOr<FieldPath> path = FieldPath::Parse(request.block->message, field);
@@ -189,8 +192,7 @@ StatusOr<Figure> MakeSweepFigure(const vosbrine::zelmondrake::TuningProvider& pr
   CollectRegions((*tree)->dynamic_top_level(), *swept, request.state.level_coordinates(),
                  &chart.regions);
   std::sort(chart.regions.begin(), chart.regions.end());
-  chart.regions.erase(std::unique(chart.regions.begin(), chart.regions.end()),
-                      chart.regions.end());
+  chart.regions.erase(std::unique(chart.regions.begin(), chart.regions.end()), chart.regions.end());
   if (chart.regions.empty() && (!request.from || !request.to)) {
     return InvalidArgumentError(StrCat(request.block->message->name(), " has no ",
                                        Level::Type_Name(swept->level),
@@ -206,8 +208,8 @@ StatusOr<Figure> MakeSweepFigure(const vosbrine::zelmondrake::TuningProvider& pr
   chart.x_min = request.from.value_or(low - margin);
   chart.x_max = request.to.value_or(high + margin);
   if (!(chart.x_min < chart.x_max)) {
-    return InvalidArgumentError(StrCat("empty range ", FormatNumber(chart.x_min), " to ",
-                                       FormatNumber(chart.x_max)));
+    return InvalidArgumentError(
+        StrCat("empty range ", FormatNumber(chart.x_min), " to ", FormatNumber(chart.x_max)));
   }
   const std::vector<double> positions =
       SweepPositions(chart.x_min, chart.x_max, request.samples, chart.regions);
@@ -330,7 +332,10 @@ struct CurveBlock {
 
 constexpr Rgb kRed = {214, 39, 40}, kGreen = {44, 160, 44}, kBlue = {31, 119, 180};
 constexpr std::array<CurveBlock, 2> kCurveBlocks = {{
-    {"GammaTuning", "static_param.gamma_x", {"gamma_r", "gamma_g", "gamma_b"}, {kRed, kGreen, kBlue}},
+    {"GammaTuning",
+     "static_param.gamma_x",
+     {"gamma_r", "gamma_g", "gamma_b"},
+     {kRed, kGreen, kBlue}},
     {"SensorGammaTuning", nullptr, {"gamma_y", nullptr, nullptr}, {kGreen}},
 }};
 
@@ -354,9 +359,9 @@ void AddCurveInForce(const vosbrine::zelmondrake::GammaTuning& gamma, LineChart&
     notes.push_back(StrCat("no tone curve in force: ", status.message()));
     return;
   }
-  for (const auto& [name, points, colour] :
-       {std::tuple{"red", &curve.red, kRed}, {"green", &curve.green, kGreen},
-        {"blue", &curve.blue, kBlue}}) {
+  for (const auto& [name, points, colour] : {std::tuple{"red", &curve.red, kRed},
+                                             {"green", &curve.green, kGreen},
+                                             {"blue", &curve.blue, kBlue}}) {
     PlotLine line;
     line.label = StrCat(name, " in force (ITP)");
     line.style = PlotLine::Style::kDashed;
@@ -385,7 +390,8 @@ StatusOr<Figure> MakeCurveFigure(const vosbrine::zelmondrake::TuningProvider& pr
   chart.y_label = "output";
   chart.x_min = 0;
   chart.x_max = 1;
-  chart.lines.push_back({"linear", {0, 1}, {0, 1}, {}, {}, PlotLine::Style::kDotted, Rgb{127, 127, 127}});
+  chart.lines.push_back(
+      {"linear", {0, 1}, {0, 1}, {}, {}, PlotLine::Style::kDotted, Rgb{127, 127, 127}});
 
   std::vector<double> knots;
   if (curves->x_path != nullptr) {
@@ -441,8 +447,7 @@ StatusOr<double> ParseNumber(const std::string& option, const std::string& value
   return number;
 }
 
-StatusOr<int> ParseCount(const std::string& option, const std::string& value, int low,
-                         int high) {
+StatusOr<int> ParseCount(const std::string& option, const std::string& value, int low, int high) {
   StatusOr<double> number = ParseNumber(option, value);
   if (!number.ok()) return number.status();
   if (*number != std::floor(*number) || *number < low || *number > high) {
@@ -540,13 +545,12 @@ StatusOr<PlotRequest> ParsePlotArgs(const std::vector<std::string>& args) {
   } else if (args[0] == "curves") {
     request.kind = PlotKind::kCurves;
   } else {
-    return InvalidArgumentError(
-        StrCat("unknown plot '", args[0], "': sweep, shading or curves"));
+    return InvalidArgumentError(StrCat("unknown plot '", args[0], "': sweep, shading or curves"));
   }
   std::vector<std::string> eval_args;
   int blocks_named = 0;
-  if (Status status = ParsePlotOptions({args.begin() + 1, args.end()}, request, eval_args,
-                                       blocks_named);
+  if (Status status =
+          ParsePlotOptions({args.begin() + 1, args.end()}, request, eval_args, blocks_named);
       !status.ok()) {
     return status;
   }
@@ -592,6 +596,10 @@ StatusOr<PlotRequest> ParsePlotArgs(const std::vector<std::string>& args) {
 
 StatusOr<Figure> MakePlotFigure(const vosbrine::zelmondrake::TuningProvider& provider,
                                 const PlotRequest& request) {
+  if (request.block == nullptr) return InvalidArgumentError("no block to plot");
+  if (request.kind == PlotKind::kSweep && request.samples < 2) {
+    return InvalidArgumentError(StrCat("a sweep takes at least 2 steps, not ", request.samples));
+  }
   switch (request.kind) {
     case PlotKind::kSweep:
       return MakeSweepFigure(provider, request);

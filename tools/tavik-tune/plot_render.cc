@@ -114,7 +114,8 @@ Status CheckMaps(const HeatMapGrid& grid) {
                                          " values for ", map.columns, " by ", map.rows));
     }
     if (!AllFinite(map.values)) {
-      return InvalidArgumentError(StrCat("heat map '", map.title, "' has values that aren't finite"));
+      return InvalidArgumentError(
+          StrCat("heat map '", map.title, "' has values that aren't finite"));
     }
   }
   return OkStatus();
@@ -230,8 +231,8 @@ void DrawLineChart(const Figure& figure, const LineChart& chart) {
     pllsty(1);
     if (!line.marker_x.empty()) {
       plschr(0, kTextScale * kMarkerScale);
-      plstring(static_cast<PLINT>(line.marker_x.size()), line.marker_x.data(),
-               line.marker_y.data(), kMarker);
+      plstring(static_cast<PLINT>(line.marker_x.size()), line.marker_x.data(), line.marker_y.data(),
+               kMarker);
       plschr(0, kTextScale);
     }
     opts.push_back(PL_LEGEND_LINE | (line.marker_x.empty() ? 0 : PL_LEGEND_SYMBOL));
@@ -253,20 +254,19 @@ void DrawLineChart(const Figure& figure, const LineChart& chart) {
   PLFLT legend_width = 0, legend_height = 0;
   plwidth(1.0);
   pllegend(&legend_width, &legend_height, PL_LEGEND_BACKGROUND,
-           PL_POSITION_RIGHT | PL_POSITION_OUTSIDE | PL_POSITION_VIEWPORT, 0.02, 0.0, 0.06, kBackground, kInk, 1, 0, 0, static_cast<PLINT>(labels.size()),
-           opts.data(), 1.0, 0.8, 2.0, 0.0, text_colours.data(), texts.data(), nullptr, nullptr,
-           nullptr, nullptr, line_colours.data(), line_styles.data(), line_widths.data(),
-           symbol_colours.data(), symbol_scales.data(), symbol_numbers.data(), symbols.data());
+           PL_POSITION_RIGHT | PL_POSITION_OUTSIDE | PL_POSITION_VIEWPORT, 0.02, 0.0, 0.06,
+           kBackground, kInk, 1, 0, 0, static_cast<PLINT>(labels.size()), opts.data(), 1.0, 0.8,
+           2.0, 0.0, text_colours.data(), texts.data(), nullptr, nullptr, nullptr, nullptr,
+           line_colours.data(), line_styles.data(), line_widths.data(), symbol_colours.data(),
+           symbol_scales.data(), symbol_numbers.data(), symbols.data());
 }
 
 // Viridis, by five stops: perceptually even and readable in grey.
 void SetHeatColourMap() {
   const std::array<PLFLT, 5> position = {0.0, 0.25, 0.5, 0.75, 1.0};
   const std::array<PLFLT, 5> red = {68 / 255.0, 59 / 255.0, 33 / 255.0, 94 / 255.0, 253 / 255.0};
-  const std::array<PLFLT, 5> green = {1 / 255.0, 82 / 255.0, 145 / 255.0, 201 / 255.0,
-                                      231 / 255.0};
-  const std::array<PLFLT, 5> blue = {84 / 255.0, 139 / 255.0, 140 / 255.0, 98 / 255.0,
-                                     37 / 255.0};
+  const std::array<PLFLT, 5> green = {1 / 255.0, 82 / 255.0, 145 / 255.0, 201 / 255.0, 231 / 255.0};
+  const std::array<PLFLT, 5> blue = {84 / 255.0, 139 / 255.0, 140 / 255.0, 98 / 255.0, 37 / 255.0};
   plscmap1n(256);
   plscmap1l(/*itype=rgb*/ 1, 5, position.data(), red.data(), green.data(), blue.data(), nullptr);
 }
@@ -308,8 +308,8 @@ void DrawHeatMaps(const Figure& figure, const HeatMapGrid& grid) {
       }
       column_pointers[c] = columns_of_values[c].data();
     }
-    plimage(column_pointers.data(), map.columns, map.rows, 0, map.columns, 0, map.rows,
-            value_low, value_high, 0, map.columns, 0, map.rows);
+    plimage(column_pointers.data(), map.columns, map.rows, 0, map.columns, 0, map.rows, value_low,
+            value_high, 0, map.columns, 0, map.rows);
     plcol0(kInk);
     plbox("bcnst", 0, 0, "bcnstv", 0, 0);
     plmtex("t", 0.7, 0.5, 0.5, PlotText(map.title).c_str());
@@ -334,8 +334,8 @@ void DrawHeatMaps(const Figure& figure, const HeatMapGrid& grid) {
   const PLINT value_counts[] = {kSteps};
   PLFLT bar_width = 0, bar_height = 0;
   plcolorbar(&bar_width, &bar_height, PL_COLORBAR_IMAGE,
-             PL_POSITION_RIGHT | PL_POSITION_OUTSIDE | PL_POSITION_VIEWPORT, 0.03, 0.0, 0.03,
-             0.8, kBackground, kInk, 1, 0, 0, kInk, 1.0, 1, label_options, labels, 1, axis_options,
+             PL_POSITION_RIGHT | PL_POSITION_OUTSIDE | PL_POSITION_VIEWPORT, 0.03, 0.0, 0.03, 0.8,
+             kBackground, kInk, 1, 0, 0, kInk, 1.0, 1, label_options, labels, 1, axis_options,
              ticks, sub_ticks, value_counts, values);
 }
 
@@ -359,8 +359,8 @@ Status RenderFigure(const Figure& figure, const std::string& path, ImageSize siz
   StatusOr<ImageFormat> format = ImageFormatOfPath(path);
   if (!format.ok()) return format.status();
   if (size.width < 64 || size.height < 64) {
-    return InvalidArgumentError(StrCat("image size ", size.width, " by ", size.height,
-                                       " is too small"));
+    return InvalidArgumentError(
+        StrCat("image size ", size.width, " by ", size.height, " is too small"));
   }
   if (const LineChart* chart = std::get_if<LineChart>(&figure.content)) {
     if (Status status = CheckChart(*chart); !status.ok()) return status;
@@ -369,8 +369,8 @@ Status RenderFigure(const Figure& figure, const std::string& path, ImageSize siz
   }
   const char* device = DeviceName(*format);
   if (!DeviceInstalled(device)) {
-    return FailedPreconditionError(StrCat("PLplot has no ", device,
-                                          " driver: install Debian's plplot-driver-cairo"));
+    return FailedPreconditionError(
+        StrCat("PLplot has no ", device, " driver: install Debian's plplot-driver-cairo"));
   }
   // PLplot would end the process on a file it can't open.
   if (std::FILE* file = std::fopen(path.c_str(), "wb"); file != nullptr) {

@@ -31,8 +31,8 @@ Figure LineFigure() {
   red.y = {1.2, 1.2, 1.2, 2.0, 2.0, 2.0};
   red.marker_x = {2000, 3000, 5000, 6000};
   red.marker_y = {1.2, 1.2, 2.0, 2.0};
-  PlotLine reference{"reference # 1", {1600, 6400}, {1, 1}, {}, {}, PlotLine::Style::kDotted,
-                     Rgb{127, 127, 127}};
+  PlotLine reference{"reference # 1",          {1600, 6400},      {1, 1}, {}, {},
+                     PlotLine::Style::kDotted, Rgb{127, 127, 127}};
   chart.lines = {red, reference};
   return {"WbTuning along colour temperature (K)", {"KEY", "gain 1, the others at 0"}, chart};
 }
@@ -98,19 +98,18 @@ TEST(RenderFigureTest, FiguresThatCantBeDrawnAreRefusedBeforeDrawing) {
   Figure figure = LineFigure();
   auto& chart = std::get<LineChart>(figure.content);
   chart.lines[0].y.pop_back();
-  EXPECT_THAT(RenderFigure(figure, path),
-              StatusIs(StatusCode::kInvalidArgument,
-                       "line 'wb_gains[0]' has x and y of other lengths"));
+  EXPECT_THAT(
+      RenderFigure(figure, path),
+      StatusIs(StatusCode::kInvalidArgument, "line 'wb_gains[0]' has x and y of other lengths"));
   chart = std::get<LineChart>(LineFigure().content);
   chart.lines[0].y[1] = NAN;
-  EXPECT_THAT(RenderFigure(figure, path),
-              StatusIs(StatusCode::kInvalidArgument,
-                       "line 'wb_gains[0]' has values that aren't finite"));
+  EXPECT_THAT(
+      RenderFigure(figure, path),
+      StatusIs(StatusCode::kInvalidArgument, "line 'wb_gains[0]' has values that aren't finite"));
   chart = std::get<LineChart>(LineFigure().content);
   chart.x_max = chart.x_min;
-  EXPECT_THAT(RenderFigure(figure, path),
-              StatusIs(StatusCode::kInvalidArgument,
-                       "x range 1600 to 1600 is empty or not finite"));
+  EXPECT_THAT(RenderFigure(figure, path), StatusIs(StatusCode::kInvalidArgument,
+                                                   "x range 1600 to 1600 is empty or not finite"));
 
   Figure maps = MapFigure();
   auto& grid = std::get<HeatMapGrid>(maps.content);
@@ -119,18 +118,17 @@ TEST(RenderFigureTest, FiguresThatCantBeDrawnAreRefusedBeforeDrawing) {
               StatusIs(StatusCode::kInvalidArgument, "heat map 'Gr' has 5 values for 3 by 2"));
   grid = std::get<HeatMapGrid>(MapFigure().content);
   grid.value_min = 3;
-  EXPECT_THAT(RenderFigure(maps, path),
-              StatusIs(StatusCode::kInvalidArgument,
-                       "value range 3 to 2 is inverted or not finite"));
+  EXPECT_THAT(RenderFigure(maps, path), StatusIs(StatusCode::kInvalidArgument,
+                                                 "value range 3 to 2 is inverted or not finite"));
   grid.maps.clear();
   EXPECT_THAT(RenderFigure(maps, path),
               StatusIs(StatusCode::kInvalidArgument, "no heat map to draw"));
 
   EXPECT_THAT(RenderFigure(LineFigure(), path, {10, 600}),
               StatusIs(StatusCode::kInvalidArgument, "image size 10 by 600 is too small"));
-  EXPECT_THAT(RenderFigure(LineFigure(), directory.Path("wb.gif")),
-              StatusIs(StatusCode::kInvalidArgument, directory.Path("wb.gif") +
-                                                         ": write .png or .svg"));
+  EXPECT_THAT(
+      RenderFigure(LineFigure(), directory.Path("wb.gif")),
+      StatusIs(StatusCode::kInvalidArgument, directory.Path("wb.gif") + ": write .png or .svg"));
   // Nothing was drawn.
   EXPECT_EQ(PngProblem(path, 960, 600), path + ": cannot open");
 }

@@ -36,9 +36,11 @@ constexpr char kKey[] = "BRIMAL_REAR_GN1_NORMAL, FULL_4_3_FULL_15_30FPS, VIEWFIN
 // The request of `kind` for the rear viewfinder of `directory`, with `extra` options.
 StatusOr<PlotRequest> Request(const std::string& kind, const std::string& directory,
                               std::vector<std::string> extra) {
-  std::vector<std::string> args = {kind,     directory, "--sensor", "BRIMAL_REAR_GN1_NORMAL",
-                                   "--mode", "FULL_4_3_FULL_15_30FPS", "--usecase",
-                                   "VIEWFINDER", "-o", "out.png"};
+  std::vector<std::string> args = {kind,        directory,
+                                   "--sensor",  "BRIMAL_REAR_GN1_NORMAL",
+                                   "--mode",    "FULL_4_3_FULL_15_30FPS",
+                                   "--usecase", "VIEWFINDER",
+                                   "-o",        "out.png"};
   args.insert(args.end(), extra.begin(), extra.end());
   return ParsePlotArgs(args);
 }
@@ -89,16 +91,16 @@ TEST_F(PlotTest, SweepAlongColourTemperatureEvaluatesStepsAndRegionEdges) {
   EXPECT_THAT(red.x, ElementsAre(1600, 2000, 2800, 3000, 4000, 5000, 5200, 6000, 6400));
   // Tungsten at gain 1 holds 1.2, daylight 2.0; 4000 K lies halfway across the gap.
   const double tungsten = 1.2f, daylight = 2.0f;
-  EXPECT_THAT(red.y, ElementsAre(tungsten, tungsten, tungsten, tungsten,
-                                 Blend(1.2f, 2.0f, 0.5f), daylight, daylight, daylight, daylight));
+  EXPECT_THAT(red.y, ElementsAre(tungsten, tungsten, tungsten, tungsten, Blend(1.2f, 2.0f, 0.5f),
+                                 daylight, daylight, daylight, daylight));
   EXPECT_THAT(red.marker_x, ElementsAre(2000, 3000, 5000, 6000));
   EXPECT_THAT(red.marker_y, ElementsAre(tungsten, tungsten, daylight, daylight));
 }
 
 TEST_F(PlotTest, SweepPointInTheGapMatchesTheHandBlend) {
   StatusOr<Figure> figure =
-      Make("sweep", {"--block", "WbTuning", "--field", "wb_gains", "--along", "CCT", "--gain",
-                     "1", "--from", "3000", "--to", "5000", "--samples", "5"});
+      Make("sweep", {"--block", "WbTuning", "--field", "wb_gains", "--along", "CCT", "--gain", "1",
+                     "--from", "3000", "--to", "5000", "--samples", "5"});
   ASSERT_THAT(figure, IsOk());
   const LineChart& chart = std::get<LineChart>(figure->content);
   ASSERT_THAT(chart.lines, SizeIs(3));
@@ -114,9 +116,9 @@ TEST_F(PlotTest, SweepPointInTheGapMatchesTheHandBlend) {
 }
 
 TEST_F(PlotTest, SweepAlongGainFindsTheGainLevelUnderTheRegionOfTheColourTemperature) {
-  StatusOr<Figure> figure = Make("sweep", {"--block", "wb", "--field", "wb_gains[0]", "--along",
-                                           "gain", "--cct", "2500", "--from", "0", "--to", "10",
-                                           "--samples", "2"});
+  StatusOr<Figure> figure =
+      Make("sweep", {"--block", "wb", "--field", "wb_gains[0]", "--along", "gain", "--cct", "2500",
+                     "--from", "0", "--to", "10", "--samples", "2"});
   ASSERT_THAT(figure, IsOk());
   EXPECT_EQ(figure->title, "WbTuning along gain");
   EXPECT_THAT(figure->subtitle, ElementsAre(kKey, "cct 2500, the others at 0"));
@@ -144,13 +146,13 @@ TEST_F(PlotTest, SweepFromTheGapOfAnotherLevelReachesTheLevelsOfBothRegions) {
 }
 
 TEST_F(PlotTest, SweepWithoutALevelOfTheCoordinateNeedsARange) {
-  EXPECT_THAT(Make("sweep", {"--block", "wb", "--field", "wb_gains[0]", "--along", "gain",
-                             "--cct", "5500"}),
+  EXPECT_THAT(Make("sweep",
+                   {"--block", "wb", "--field", "wb_gains[0]", "--along", "gain", "--cct", "5500"}),
               StatusIs(StatusCode::kInvalidArgument,
                        "WbTuning has no GAIN level at this state: give --from and --to"));
-  StatusOr<Figure> figure = Make("sweep", {"--block", "wb", "--field", "wb_gains[0]", "--along",
-                                           "gain", "--cct", "5500", "--from", "1", "--to", "8",
-                                           "--samples", "3"});
+  StatusOr<Figure> figure =
+      Make("sweep", {"--block", "wb", "--field", "wb_gains[0]", "--along", "gain", "--cct", "5500",
+                     "--from", "1", "--to", "8", "--samples", "3"});
   ASSERT_THAT(figure, IsOk());
   const LineChart& chart = std::get<LineChart>(figure->content);
   EXPECT_TRUE(chart.regions.empty());
@@ -160,9 +162,8 @@ TEST_F(PlotTest, SweepWithoutALevelOfTheCoordinateNeedsARange) {
 }
 
 TEST_F(PlotTest, DisabledBlockIsFlatAtItsFirstLeafAndSaysSo) {
-  StatusOr<Figure> figure =
-      Make("sweep", {"--block", "ccm", "--field", "ccm_gains[0]", "--along", "cct", "--samples",
-                     "3"});
+  StatusOr<Figure> figure = Make(
+      "sweep", {"--block", "ccm", "--field", "ccm_gains[0]", "--along", "cct", "--samples", "3"});
   ASSERT_THAT(figure, IsOk());
   EXPECT_EQ(figure->title,
             "CcmTuning along colour temperature (K), disabled: its first leaf everywhere");
@@ -180,10 +181,10 @@ TEST_F(PlotTest, NearestUseCaseIsNamed) {
   ASSERT_THAT(provider, IsOk());
   StatusOr<Figure> figure = MakePlotFigure(**provider, *request);
   ASSERT_THAT(figure, IsOk());
-  EXPECT_THAT(figure->subtitle,
-              ElementsAre(StrCat(kKey, " (nearest to BRIMAL_REAR_GN1_NORMAL, "
-                                       "FULL_4_3_FULL_15_30FPS, SNAPSHOT)"),
-                          "bv 3, the others at 0"));
+  EXPECT_THAT(figure->subtitle, ElementsAre(StrCat(kKey,
+                                                   " (nearest to BRIMAL_REAR_GN1_NORMAL, "
+                                                   "FULL_4_3_FULL_15_30FPS, SNAPSHOT)"),
+                                            "bv 3, the others at 0"));
 }
 
 TEST_F(PlotTest, SweepFailuresAreExplained) {
@@ -194,13 +195,13 @@ TEST_F(PlotTest, SweepFailuresAreExplained) {
                        "FIELD[i]"));
   EXPECT_THAT(Make("sweep", {"--block", "dmsc", "--field", "enable", "--along", "cct"}),
               StatusIs(StatusCode::kNotFound, StrCat(kKey, " has no tree for DmscTuning")));
-  EXPECT_THAT(Make("sweep", {"--block", "wb", "--field", "gains", "--along", "cct"}),
-              StatusIs(StatusCode::kInvalidArgument,
-                       "no field 'gains' in WbTuning or its dynamic_param"));
-  EXPECT_THAT(Make("sweep", {"--block", "wb", "--field", "wb_gains[3]", "--along", "cct",
-                             "--from", "1000", "--to", "2000"}),
-              StatusIs(StatusCode::kOutOfRange,
-                       "at cct 1000: wb_gains[3] is past the end of 3 values"));
+  EXPECT_THAT(
+      Make("sweep", {"--block", "wb", "--field", "gains", "--along", "cct"}),
+      StatusIs(StatusCode::kInvalidArgument, "no field 'gains' in WbTuning or its dynamic_param"));
+  EXPECT_THAT(
+      Make("sweep", {"--block", "wb", "--field", "wb_gains[3]", "--along", "cct", "--from", "1000",
+                     "--to", "2000"}),
+      StatusIs(StatusCode::kOutOfRange, "at cct 1000: wb_gains[3] is past the end of 3 values"));
 }
 
 TEST_F(PlotTest, ShadingTablesAsTuned) {
@@ -349,9 +350,9 @@ TEST_F(PlotTest, SensorGammaCurveOnAnEvenAxis) {
   ASSERT_THAT(chart.lines, SizeIs(2));
   EXPECT_EQ(chart.lines[1].label, "gamma_y, tuned");
   EXPECT_THAT(chart.lines[1].x, ElementsAre(0, 0.25, 0.5, 0.75, 1));
-  EXPECT_THAT(chart.lines[1].y, ElementsAre(0, static_cast<double>(0.3f),
-                                            static_cast<double>(0.55f),
-                                            static_cast<double>(0.8f), 1));
+  EXPECT_THAT(chart.lines[1].y,
+              ElementsAre(0, static_cast<double>(0.3f), static_cast<double>(0.55f),
+                          static_cast<double>(0.8f), 1));
 }
 
 TEST_F(PlotTest, BlockWithoutCurves) {
@@ -402,6 +403,20 @@ TEST(PlotGammaTest, CurveInForceIsTheTranslatorsResampledCurve) {
   EXPECT_EQ(chart.lines[5].x[9], 9 / 63.0f);
 }
 
+TEST_F(PlotTest, RequestsMadeByHandAreCheckedToo) {
+  StatusOr<PlotRequest> request = Request(
+      "sweep", directory_.path(), {"--block", "wb", "--field", "wb_gains", "--along", "cct"});
+  ASSERT_THAT(request, IsOk());
+  auto provider = LoadForest(request->source);
+  ASSERT_THAT(provider, IsOk());
+  request->samples = 1;
+  EXPECT_THAT(MakePlotFigure(**provider, *request),
+              StatusIs(StatusCode::kInvalidArgument, "a sweep takes at least 2 steps, not 1"));
+  request->block = nullptr;
+  EXPECT_THAT(MakePlotFigure(**provider, *request),
+              StatusIs(StatusCode::kInvalidArgument, "no block to plot"));
+}
+
 TEST_F(PlotTest, RunPlotWritesThePicture) {
   for (const char* name : {"wb.png", "wb.svg"}) {
     TempDir out;
@@ -423,13 +438,12 @@ TEST(PlotRunTest, ForestThatDoesNotLoad) {
   TempDir empty;
   StatusOr<PlotRequest> request = Request("shading", empty.path(), {"-o", empty.Path("x.png")});
   ASSERT_THAT(request, IsOk());
-  EXPECT_THAT(RunPlot(*request),
-              StatusIs(StatusCode::kInvalidArgument, "Empty input paths."));
+  EXPECT_THAT(RunPlot(*request), StatusIs(StatusCode::kInvalidArgument, "Empty input paths."));
 }
 
 TEST(PlotArgsTest, KindsAndTheirDefaults) {
-  StatusOr<PlotRequest> shading = Request("shading", "dir", {"--cct", "4750", "--device", "x",
-                                                              "--calibration", "c.textproto"});
+  StatusOr<PlotRequest> shading =
+      Request("shading", "dir", {"--cct", "4750", "--device", "x", "--calibration", "c.textproto"});
   ASSERT_THAT(shading, IsOk());
   EXPECT_EQ(shading->kind, PlotKind::kShading);
   EXPECT_EQ(shading->block->message->name(), "LscTuning");
@@ -448,8 +462,9 @@ TEST(PlotArgsTest, KindsAndTheirDefaults) {
   EXPECT_EQ(curves->output, "gamma.svg");
 
   StatusOr<PlotRequest> sweep =
-      Request("sweep", "dir", {"--block", "wb", "--field", "wb_gains", "--field", "enable",
-                               "--along", "exp-ratio", "--width", "640", "--height", "400"});
+      Request("sweep", "dir",
+              {"--block", "wb", "--field", "wb_gains", "--field", "enable", "--along", "exp-ratio",
+               "--width", "640", "--height", "400"});
   ASSERT_THAT(sweep, IsOk());
   EXPECT_EQ(sweep->kind, PlotKind::kSweep);
   EXPECT_THAT(sweep->fields, ElementsAre("wb_gains", "enable"));
@@ -468,17 +483,17 @@ TEST(PlotArgsTest, BadArgumentsAreExplained) {
   };
   EXPECT_THAT(ParsePlotArgs({}), StatusIs(StatusCode::kInvalidArgument,
                                           "name what to plot: sweep, shading or curves"));
-  EXPECT_THAT(ParsePlotArgs({"pie", "dir"}),
-              StatusIs(StatusCode::kInvalidArgument,
-                       "unknown plot 'pie': sweep, shading or curves"));
+  EXPECT_THAT(
+      ParsePlotArgs({"pie", "dir"}),
+      StatusIs(StatusCode::kInvalidArgument, "unknown plot 'pie': sweep, shading or curves"));
   EXPECT_THAT(ParsePlotArgs({"shading", "dir", "--sensor", "BRIMAL_REAR_GN1_NORMAL", "--mode",
                              "FULL_4_3_FULL_15_30FPS", "--usecase", "VIEWFINDER"}),
               StatusIs(StatusCode::kInvalidArgument, "-o FILE is required"));
   EXPECT_THAT(ParsePlotArgs({"shading", "dir", "-o"}),
               StatusIs(StatusCode::kInvalidArgument, "-o needs a value"));
-  EXPECT_THAT(ParsePlotArgs({"shading", "dir", "-o", "x.png"}),
-              StatusIs(StatusCode::kInvalidArgument,
-                       "--sensor, --mode and --usecase are all required"));
+  EXPECT_THAT(
+      ParsePlotArgs({"shading", "dir", "-o", "x.png"}),
+      StatusIs(StatusCode::kInvalidArgument, "--sensor, --mode and --usecase are all required"));
   EXPECT_THAT(Request("shading", "dir", {"-o", "x.gif"}),
               StatusIs(StatusCode::kInvalidArgument, "x.gif: write .png or .svg"));
   EXPECT_THAT(Request("sweep", "dir", {"--field", "wb_gains", "--along", "cct"}),
@@ -507,9 +522,9 @@ TEST(PlotArgsTest, BadArgumentsAreExplained) {
               StatusIs(StatusCode::kInvalidArgument, "unknown option --colour"));
   EXPECT_THAT(Request("shading", "dir", {"--block", "wb"}),
               StatusIs(StatusCode::kInvalidArgument, "shading draws LscTuning only"));
-  EXPECT_THAT(Request("curves", "dir", {"--along", "cct"}),
-              StatusIs(StatusCode::kInvalidArgument,
-                       "--field, --along, --from and --to are for sweep"));
+  EXPECT_THAT(
+      Request("curves", "dir", {"--along", "cct"}),
+      StatusIs(StatusCode::kInvalidArgument, "--field, --along, --from and --to are for sweep"));
 }
 
 }  // namespace

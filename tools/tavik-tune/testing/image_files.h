@@ -111,9 +111,8 @@ inline std::string SvgProblem(const std::string& path) {
     const bool self_closing = tag.back() == '/';
     const size_t name_start = closing ? 1 : 0;
     const size_t name_end = tag.find_first_of(" \t\r\n/", name_start);
-    const std::string name = tag.substr(name_start, name_end == std::string::npos
-                                                        ? std::string::npos
-                                                        : name_end - name_start);
+    const std::string name = tag.substr(
+        name_start, name_end == std::string::npos ? std::string::npos : name_end - name_start);
     if (name.empty()) return "tag without a name";
     if (closing) {
       if (open.empty() || open.back() != name) return StrCat("</", name, "> closes nothing open");
