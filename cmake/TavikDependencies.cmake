@@ -5,6 +5,9 @@ find_package(absl CONFIG REQUIRED)
 find_package(fmt CONFIG REQUIRED)
 find_package(Eigen3 CONFIG REQUIRED)
 include(FindAndroidBase)
+# The tools draw their pictures with PLplot (tavik-tune plot).
+find_package(PkgConfig REQUIRED)
+pkg_check_modules(PLPLOT REQUIRED IMPORTED_TARGET plplot)
 
 if(TAVIK_BUILD_TESTS)
   find_package(GTest CONFIG REQUIRED)

@@ -10,6 +10,7 @@ packages=(
   android-libbase-dev android-liblog-dev
   libeigen3-dev libfmt-dev
   libgtest-dev libgmock-dev libbenchmark-dev
+  libplplot-dev plplot-driver-cairo
   clang-14 libclang-rt-14-dev
 )
 

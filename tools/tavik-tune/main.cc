@@ -5,6 +5,8 @@
 //   tavik-tune lint FILE_OR_DIR...
 //   tavik-tune eval DIR --sensor S --mode M --usecase U [--cct X ...] [--block NAME ...]
 //   tavik-tune keys DIR...
+//   tavik-tune plot sweep|shading|curves DIR --sensor S --mode M --usecase U ... -o OUT.png
+//   tavik-tune diff OLD NEW
 //
 // Every verb answers --help. Exit status: 0 on success, 1 when the verb failed, 2 on a usage
 // error.
@@ -16,9 +18,11 @@
 
 #include "android-base/logging.h"
 #include "tools/common/text_proto.h"
+#include "tools/tavik-tune/diff.h"
 #include "tools/tavik-tune/eval.h"
 #include "tools/tavik-tune/keys.h"
 #include "tools/tavik-tune/lint.h"
+#include "tools/tavik-tune/plot.h"
 #include "tools/tavik-tune/proto_files.h"
 
 namespace tavik::tune {
@@ -114,6 +118,32 @@ int RunKeysVerb(const std::vector<std::string>& args) {
   return kExitOk;
 }
 
+int RunPlotVerb(const std::vector<std::string>& args) {
+  StatusOr<PlotRequest> request = ParsePlotArgs(args);
+  if (!request.ok()) {
+    std::cerr << "tavik-tune plot: " << request.status().message() << "\n";
+    return kExitUsage;
+  }
+  if (Status status = RunPlot(*request); !status.ok()) return Fail(status);
+  return kExitOk;
+}
+
+// As diff(1): 1 means only that the tunings differ, so trouble reading them is 2.
+int RunDiffVerb(const std::vector<std::string>& args) {
+  StatusOr<DiffRequest> request = ParseDiffArgs(args);
+  if (!request.ok()) {
+    std::cerr << "tavik-tune diff: " << request.status().message() << "\n";
+    return kExitUsage;
+  }
+  StatusOr<std::vector<DiffFinding>> findings = DiffTunings(*request);
+  if (!findings.ok()) {
+    std::cerr << "tavik-tune: " << findings.status().message() << "\n";
+    return kExitUsage;
+  }
+  for (const DiffFinding& finding : *findings) std::cout << finding.ToString() << "\n";
+  return findings->empty() ? kExitOk : kExitFailure;
+}
+
 const Verb kVerbs[] = {
     {"compile", "compile IN.textproto -o OUT.binarypb",
      "Compiles a tuning file from protobuf text to binary. A path containing\n"
@@ -137,6 +167,9 @@ const Verb kVerbs[] = {
      "Prints the forest's keys in sort order, each with the file that won it, and the files\n"
      "that a key dropped because another file with the same key was read first.\n",
      RunKeysVerb},
+    {"plot", "plot sweep|shading|curves DIR --sensor S --mode M --usecase U ... -o OUT.png|.svg",
+     kPlotHelp, RunPlotVerb},
+    {"diff", "diff OLD NEW", kDiffHelp, RunDiffVerb},
 };
 
 void PrintUsage(std::ostream& out) {
