@@ -121,18 +121,6 @@ const Message* FindMatchingMessage(const Message& root,
   return current;
 }
 
-// (1 - t) * a + t * b as two single-precision products and one sum. The library is built with
-// -ffp-contract=off, so the compiler may not fuse them into a multiply-add.
-inline float Blend(float a, float b, float t) {
-  const float weight_a = (1.0f - t) * a;
-  const float weight_b = t * b;
-  return weight_a + weight_b;
-}
-
-void BlendRepeatedFloats(float* out, const float* source, int size, float t) {
-  for (int i = 0; i < size; ++i) out[i] = Blend(out[i], source[i], t);
-}
-
 // The visitor of one blend: `out` is traversed, `msg2` followed along the same path.
 class BlendingVisitor {
  public:
@@ -157,8 +145,8 @@ class BlendingVisitor {
     const Reflection* reflection = message->GetReflection();
     if (!field->is_repeated()) {
       reflection->SetFloat(message, field,
-                           Blend(reflection->GetFloat(*message, field),
-                                 source->GetReflection()->GetFloat(*source, field), t_));
+                           BlendFloat(reflection->GetFloat(*message, field),
+                                      source->GetReflection()->GetFloat(*source, field), t_));
     } else {
       // The raw arrays let the inner loop vectorise; the field-ref API would cost a virtual call
       // per element.
@@ -173,8 +161,7 @@ class BlendingVisitor {
         TAVIK_LOG(ERROR) << "Mismatched sizes found at the repeated field " << *field_path;
         return false;
       }
-      BlendRepeatedFloats(out_values->mutable_data(), source_values.data(), out_values->size(),
-                          t_);
+      BlendFloats(out_values->mutable_data(), source_values.data(), out_values->size(), t_);
     }
     TAVIK_LOG(VERBOSE) << *field_path << " is interpolated.";
     return false;
@@ -216,72 +203,34 @@ std::optional<float> CoordinateForLevel(vosbrine::Level::Type type,
 }
 
 Status LinearInterpolateLevel(const vosbrine::Level& level, const vosbrine::CameraState& state,
-                              Message* out);
+                              const PreparedTree* prepared, Message* out);
 
 // Fills `out` from one region: its leaf, or the evaluation of its child level.
 Status FillRegion(const vosbrine::Node& node, const vosbrine::CameraState& state,
-                  std::string_view unpack_failure, Message* out) {
+                  const PreparedTree* prepared, std::string_view unpack_failure, Message* out) {
   if (node.has_dynamic_param()) {
-    if (!node.dynamic_param().UnpackTo(out)) {
+    if (!UnpackFromPrepared(node.dynamic_param(), prepared, out)) {
       return InvalidArgumentError(StrCat(unpack_failure, out->GetTypeName()));
     }
     return OkStatus();
   }
   // An unset oneof reads as an empty child level, which fails as such.
-  return LinearInterpolateLevel(node.child_level(), state, out);
+  return LinearInterpolateLevel(node.child_level(), state, prepared, out);
 }
 
-Status LinearInterpolateLevel(const vosbrine::Level& level, const vosbrine::CameraState& state,
-                              Message* out) {
-  const auto& nodes = level.nodes();
-  if (nodes.empty()) return InvalidArgumentError(StrCat("Empty level. ", out->GetTypeName()));
-  const std::optional<float> coordinate = CoordinateForLevel(level.type(),
-                                                             state.level_coordinates());
-  if (!coordinate.has_value()) return InvalidArgumentError("Unexpected node type.");
-  const float x = *coordinate;
-
-  // First region whose upper bound reaches x; past all regions, the last one. A NaN reaches none
-  // of the comparisons and so ends at the first region.
-  auto reaching = std::lower_bound(
-      nodes.begin(), nodes.end(), x,
-      [](const vosbrine::Node& node, float value) { return node.upper() < value; });
-  if (reaching == nodes.end()) --reaching;
-  const int i = static_cast<int>(reaching - nodes.begin());
-
-  const bool single_region = nodes[i].lower() <= x || i == 0;
-  const vosbrine::Node& first = single_region ? nodes[i] : nodes[i - 1];
-  TAVIK_RETURN_IF_ERROR(FillRegion(first, state, "Failed to Unpack first_region. ", out));
-  if (single_region) return OkStatus();
-
-  const vosbrine::Node& second = nodes[i];
-  std::unique_ptr<Message> second_message(out->New());
-  TAVIK_RETURN_IF_ERROR(
-      FillRegion(second, state, "Failed to Unpack second_region. ", second_message.get()));
-  if (!LinearInterpolateMessage(*out, *second_message, first.upper(), second.lower(), x, out)) {
-    return InvalidArgumentError(
-        StrCat("Interpolation failed. Using first_region only. ", out->GetTypeName()));
-  }
-  return OkStatus();
+bool SameType(const Message& a, const Message& b) {
+  return a.GetDescriptor()->full_name() == b.GetDescriptor()->full_name();
 }
 
-}  // namespace
-
-Status InterpolateTree(const vosbrine::TuningTree& tree, const vosbrine::CameraState& state,
-                       Message* out_dynamic_msg) {
-  if (out_dynamic_msg == nullptr) return InvalidArgumentError("out_dynamic_msg is nullptr.");
-  if (&tree == &vosbrine::TuningTree::default_instance() || !tree.has_dynamic_top_level()) {
-    return InvalidArgumentError("Tree does not have dynamic_top_level.");
-  }
-  return LinearInterpolateLevel(tree.dynamic_top_level(), state, out_dynamic_msg);
-}
-
-bool LinearInterpolateMessage(const Message& msg1, const Message& msg2, float x1, float x2,
-                              float x, Message* out) {
+// LinearInterpolateMessage, blending by `plan` when there is one and verbose logging, which only
+// the walk writes, is off.
+bool InterpolateMessages(const Message& msg1, const Message& msg2, float x1, float x2, float x,
+                         const BlendPlan* plan, Message* out) {
   if (out == nullptr) {
     TAVIK_LOG(ERROR) << "Output messages pointer is nullptr.";
     return false;
   }
-  if (msg1.GetTypeName() != msg2.GetTypeName() || msg1.GetTypeName() != out->GetTypeName()) {
+  if (!SameType(msg1, msg2) || !SameType(msg1, *out)) {
     TAVIK_LOG(ERROR) << "Input and output messages are not the same type.";
     return false;
   }
@@ -301,8 +250,88 @@ bool LinearInterpolateMessage(const Message& msg1, const Message& msg2, float x1
     TAVIK_LOG(VERBOSE) << "t >= 1.0f, no interpolation was done. out = msg2.";
     return true;
   }
-  TraverseMutableMessageWithPath(out, BlendingVisitor(msg2, t));
+  if (plan != nullptr && plan->type() == out->GetDescriptor() &&
+      !android::base::ShouldLog(android::base::VERBOSE, nullptr)) {
+    plan->Blend(out, msg2, t);
+  } else {
+    BlendMessagesByReflection(msg2, t, out);
+  }
   return true;
+}
+
+Status LinearInterpolateLevel(const vosbrine::Level& level, const vosbrine::CameraState& state,
+                              const PreparedTree* prepared, Message* out) {
+  const auto& nodes = level.nodes();
+  if (nodes.empty()) return InvalidArgumentError(StrCat("Empty level. ", out->GetTypeName()));
+  const std::optional<float> coordinate = CoordinateForLevel(level.type(),
+                                                             state.level_coordinates());
+  if (!coordinate.has_value()) return InvalidArgumentError("Unexpected node type.");
+  const float x = *coordinate;
+
+  // First region whose upper bound reaches x; past all regions, the last one. A NaN reaches none
+  // of the comparisons and so ends at the first region.
+  auto reaching = std::lower_bound(
+      nodes.begin(), nodes.end(), x,
+      [](const vosbrine::Node& node, float value) { return node.upper() < value; });
+  if (reaching == nodes.end()) --reaching;
+  const int i = static_cast<int>(reaching - nodes.begin());
+
+  const bool single_region = nodes[i].lower() <= x || i == 0;
+  const vosbrine::Node& first = single_region ? nodes[i] : nodes[i - 1];
+  TAVIK_RETURN_IF_ERROR(
+      FillRegion(first, state, prepared, "Failed to Unpack first_region. ", out));
+  if (single_region) return OkStatus();
+
+  // A prepared leaf is blended from where it lies; anything else is made in a message of its own.
+  const vosbrine::Node& second = nodes[i];
+  const Message* second_message = nullptr;
+  std::unique_ptr<Message> made;
+  if (prepared != nullptr && second.has_dynamic_param()) {
+    second_message = prepared->Unpacked(second.dynamic_param(), out->GetDescriptor());
+  }
+  if (second_message == nullptr) {
+    made.reset(out->New());
+    TAVIK_RETURN_IF_ERROR(
+        FillRegion(second, state, prepared, "Failed to Unpack second_region. ", made.get()));
+    second_message = made.get();
+  }
+  const BlendPlan* plan = prepared == nullptr ? nullptr : prepared->PlanFor(out->GetDescriptor());
+  if (!InterpolateMessages(*out, *second_message, first.upper(), second.lower(), x, plan, out)) {
+    return InvalidArgumentError(
+        StrCat("Interpolation failed. Using first_region only. ", out->GetTypeName()));
+  }
+  return OkStatus();
+}
+
+Status InterpolateTreeInternal(const vosbrine::TuningTree& tree,
+                               const vosbrine::CameraState& state, const PreparedTree* prepared,
+                               Message* out_dynamic_msg) {
+  if (out_dynamic_msg == nullptr) return InvalidArgumentError("out_dynamic_msg is nullptr.");
+  if (&tree == &vosbrine::TuningTree::default_instance() || !tree.has_dynamic_top_level()) {
+    return InvalidArgumentError("Tree does not have dynamic_top_level.");
+  }
+  return LinearInterpolateLevel(tree.dynamic_top_level(), state, prepared, out_dynamic_msg);
+}
+
+}  // namespace
+
+Status InterpolateTree(const vosbrine::TuningTree& tree, const vosbrine::CameraState& state,
+                       Message* out_dynamic_msg) {
+  return InterpolateTreeInternal(tree, state, nullptr, out_dynamic_msg);
+}
+
+Status InterpolateTree(const PreparedTree& tree, const vosbrine::CameraState& state,
+                       Message* out_dynamic_msg) {
+  return InterpolateTreeInternal(tree.tree(), state, &tree, out_dynamic_msg);
+}
+
+bool LinearInterpolateMessage(const Message& msg1, const Message& msg2, float x1, float x2,
+                              float x, Message* out) {
+  return InterpolateMessages(msg1, msg2, x1, x2, x, nullptr, out);
+}
+
+void BlendMessagesByReflection(const Message& msg2, float t, Message* out) {
+  TraverseMutableMessageWithPath(out, BlendingVisitor(msg2, t));
 }
 
 void TraverseMutableMessageWithPath(Message* message, const MutableTraversalVisitor& visitor) {
