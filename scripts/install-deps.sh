@@ -10,6 +10,7 @@ packages=(
   android-libbase-dev android-liblog-dev
   libeigen3-dev libfmt-dev
   libgtest-dev libgmock-dev libbenchmark-dev
+  python3 valgrind
   clang-14 libclang-rt-14-dev
 )
 
