@@ -90,7 +90,8 @@ void RunInterpolate(benchmark::State& state, TuningCoordinates coordinates, bool
   int frame = 0;
   for (auto _ : state) {
     const auto& point = points[refresh ? (++frame & 1) : 0];
-    StatusOr<std::shared_ptr<TuningBundle>> bundle = controller->Interpolate(point, AllBlockNames());
+    StatusOr<std::shared_ptr<TuningBundle>> bundle =
+        controller->Interpolate(point, AllBlockNames());
     benchmark::DoNotOptimize(bundle);
   }
   allocations.Report(state);
@@ -158,17 +159,28 @@ class BlendFloor {
   static std::optional<float> Coordinate(vosbrine::Level::Type type,
                                          const vosbrine::LevelCoordinates& at) {
     switch (type) {
-      case vosbrine::Level::LED: return at.led_influence();
-      case vosbrine::Level::CCT: return at.cct();
-      case vosbrine::Level::BV: return at.bv();
-      case vosbrine::Level::GAIN: return at.real_gain();
-      case vosbrine::Level::EXP_RATIO: return at.exp_ratio();
-      case vosbrine::Level::SCALER_RATIO: return at.scaler_ratio();
-      case vosbrine::Level::MIRED_CCT: return at.mired_cct();
-      case vosbrine::Level::PRE_SCALER_RATIO: return at.pre_scaler_ratio();
-      case vosbrine::Level::FRAME_COUNT: return at.frame_count();
-      case vosbrine::Level::EXPOSURE_TIME_MSECS: return at.exposure_time_msecs();
-      default: return std::nullopt;
+      case vosbrine::Level::LED:
+        return at.led_influence();
+      case vosbrine::Level::CCT:
+        return at.cct();
+      case vosbrine::Level::BV:
+        return at.bv();
+      case vosbrine::Level::GAIN:
+        return at.real_gain();
+      case vosbrine::Level::EXP_RATIO:
+        return at.exp_ratio();
+      case vosbrine::Level::SCALER_RATIO:
+        return at.scaler_ratio();
+      case vosbrine::Level::MIRED_CCT:
+        return at.mired_cct();
+      case vosbrine::Level::PRE_SCALER_RATIO:
+        return at.pre_scaler_ratio();
+      case vosbrine::Level::FRAME_COUNT:
+        return at.frame_count();
+      case vosbrine::Level::EXPOSURE_TIME_MSECS:
+        return at.exposure_time_msecs();
+      default:
+        return std::nullopt;
     }
   }
 
@@ -247,8 +259,8 @@ class BlendFloor {
 void BM_Interpolate25_MissInNestedGapsFloor(benchmark::State& state) {
   std::unique_ptr<ZelTuningController> controller = MakeController();
   TuningCoordinates coordinates = InGaps();
-  const auto point = std::make_shared<ZelTuningPoint>(UseCase(), RearViewfinderInfo(),
-                                                      coordinates, false);
+  const auto point =
+      std::make_shared<ZelTuningPoint>(UseCase(), RearViewfinderInfo(), coordinates, false);
   const auto usecase = controller->GenerateTuningUseCase(*point, "");
   const google::protobuf::Message* tree_set =
       controller->provider() == nullptr || !usecase.ok()

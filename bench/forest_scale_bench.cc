@@ -128,9 +128,8 @@ void BM_ForestScale_Load(benchmark::State& state) {
   }
   allocations.Report(state);
   state.counters["files"] = forest.files();
-  state.counters["per_file"] =
-      benchmark::Counter(forest.files(), benchmark::Counter::kIsIterationInvariantRate |
-                                             benchmark::Counter::kInvert);
+  state.counters["per_file"] = benchmark::Counter(
+      forest.files(), benchmark::Counter::kIsIterationInvariantRate | benchmark::Counter::kInvert);
   state.counters["heap_MB"] = benchmark::Counter(heap / 1e6, benchmark::Counter::kAvgIterations);
   state.counters["heap_kB_per_file"] =
       benchmark::Counter(heap / 1e3 / forest.files(), benchmark::Counter::kAvgIterations);

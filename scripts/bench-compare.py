@@ -38,7 +38,8 @@ def main():
             print(f"{name:58} (only {only})")
             continue
         change = (new["median_ns"] / old["median_ns"] - 1.0) * 100.0
-        allocs = f"{old.get('allocs_per_call') or 0:g} -> {new.get('allocs_per_call') or 0:g}"
+        allocs = (f"{old.get('allocs_per_call') or 0:.3g} -> "
+                  f"{new.get('allocs_per_call') or 0:.3g}")
         instructions = ""
         if "instructions_per_call" in old and "instructions_per_call" in new:
             instructions = f"{old['instructions_per_call']} -> {new['instructions_per_call']}"

@@ -7,7 +7,6 @@
 #include <climits>
 #include <utility>
 
-
 #include "google/protobuf/dynamic_message.h"
 #include "tavik/base/file_path.h"
 #include "tavik/base/logging.h"
@@ -400,9 +399,9 @@ Status TuningProviderBase::FillSubBlockTuning(const tavik::PreparedTreeSet& tree
   }
   if (tree == nullptr) {
     drop_submessages_from(fields.static_param);
-    return tavik::NotFoundError(StrCat(
-        "TuningUsecaseData does not contain the requested sub block tuning tree for ",
-        fields.tree_name));
+    return tavik::NotFoundError(
+        StrCat("TuningUsecaseData does not contain the requested sub block tuning tree for ",
+               fields.tree_name));
   }
   const tavik::PreparedTree& prepared = tree_set.Get(fields.tree, *tree);
 

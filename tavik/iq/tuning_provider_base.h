@@ -57,7 +57,7 @@ struct SubBlockFields {
   const google::protobuf::Descriptor* block_type;
   const google::protobuf::Descriptor* tree_set_type;
   std::string tree_name;
-  const google::protobuf::FieldDescriptor* tree;  // A singular message field of the tree set.
+  const google::protobuf::FieldDescriptor* tree;    // A singular message field of the tree set.
   const google::protobuf::FieldDescriptor* enable;  // A singular bool.
   const google::protobuf::FieldDescriptor* static_param;  // Singular messages.
   const google::protobuf::FieldDescriptor* dynamic_param;

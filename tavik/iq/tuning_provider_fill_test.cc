@@ -57,8 +57,8 @@ class TuningProviderFillTest : public ::testing::Test {
     broken.mutable_dynamic_param()->set_value("\xff\xff");
     *tree_set.mutable_blc() = MakeTree(
         true, BlcStaticParam(),
-        MakeLevel(Level::GAIN, {LeafNode(1, 4, Offsets(64, 4)), LeafNode(8, 16, Offsets(65, 6)),
-                                broken}));
+        MakeLevel(Level::GAIN,
+                  {LeafNode(1, 4, Offsets(64, 4)), LeafNode(8, 16, Offsets(65, 6)), broken}));
     WriteBinarypb(dir_, "gn1.binarypb", MakeUsecaseData(Gn1Viewfinder(), tree_set));
     auto provider = zelmondrake::TuningProvider::Create({dir_.path()}, nullptr);
     ASSERT_TRUE(provider.ok()) << provider.status();
@@ -70,8 +70,7 @@ class TuningProviderFillTest : public ::testing::Test {
   template <typename T>
   Status Fill(const CameraState& state, T* out, bool bypassed = false) {
     const SubBlockFields fields(T::descriptor(), tree_set_->tree_set().GetDescriptor());
-    return provider_->FillSubBlockTuning(*tree_set_, fields, Gn1Viewfinder(), state, out,
-                                         bypassed);
+    return provider_->FillSubBlockTuning(*tree_set_, fields, Gn1Viewfinder(), state, out, bypassed);
   }
 
   TempDir dir_;
@@ -133,8 +132,7 @@ TEST_F(TuningProviderFillTest, RefilledMessageLosesWhatAFailedFillWouldNotMake) 
 }
 
 TEST_F(TuningProviderFillTest, FieldsOfAnotherTypeAreFoundAgainForTheMessageAtHand) {
-  const SubBlockFields ccm_fields(CcmTuning::descriptor(),
-                                  tree_set_->tree_set().GetDescriptor());
+  const SubBlockFields ccm_fields(CcmTuning::descriptor(), tree_set_->tree_set().GetDescriptor());
   BlcTuning out;
   TAVIK_EXPECT_OK(provider_->FillSubBlockTuning(*tree_set_, ccm_fields, Gn1Viewfinder(),
                                                 StateWith("real_gain", 2), &out, false));
@@ -144,16 +142,16 @@ TEST_F(TuningProviderFillTest, FieldsOfAnotherTypeAreFoundAgainForTheMessageAtHa
 TEST(TuningProviderExactIndexTest, UnknownEnumNumbersShareTheirEmptyName) {
   TempDir dir;
   zelmondrake::TuningTreeSet tree_set;
-  *tree_set.mutable_blc() = MakeTree(true, BlcStaticParam(),
-                                     MakeLevel(Level::GAIN, {LeafNode(1, 4, Offsets(64, 4))}));
-  const TuningUsecase unknown = MakeUsecase(static_cast<CameraSensor>(999),
-                                            FULL_4_3_FULL_15_30FPS, VIEWFINDER);
+  *tree_set.mutable_blc() =
+      MakeTree(true, BlcStaticParam(), MakeLevel(Level::GAIN, {LeafNode(1, 4, Offsets(64, 4))}));
+  const TuningUsecase unknown =
+      MakeUsecase(static_cast<CameraSensor>(999), FULL_4_3_FULL_15_30FPS, VIEWFINDER);
   WriteBinarypb(dir, "unknown.binarypb", MakeUsecaseData(unknown, tree_set));
   auto provider = zelmondrake::TuningProvider::Create({dir.path()}, nullptr);
   ASSERT_TRUE(provider.ok());
   // Another unknown number has the same key text, and so the same tuning.
-  const TuningUsecase other = MakeUsecase(static_cast<CameraSensor>(998),
-                                          FULL_4_3_FULL_15_30FPS, VIEWFINDER);
+  const TuningUsecase other =
+      MakeUsecase(static_cast<CameraSensor>(998), FULL_4_3_FULL_15_30FPS, VIEWFINDER);
   ScopedLogCapture log;
   EXPECT_TRUE((*provider)->HasTuningUsecase(other));
   EXPECT_NE((*provider)->GetTuningTreeSet(other, /*fallback=*/false), nullptr);

@@ -67,7 +67,8 @@ std::unique_ptr<BlendPlan> BlendPlan::Compile(const Descriptor* type) {
 }
 
 const BlendPlan* BlendPlan::ForGeneratedType(const Descriptor* type) {
-  if (type == nullptr || type->file()->pool() != google::protobuf::DescriptorPool::generated_pool()) {
+  if (type == nullptr ||
+      type->file()->pool() != google::protobuf::DescriptorPool::generated_pool()) {
     return nullptr;
   }
   static std::mutex* const mutex = new std::mutex;
@@ -83,8 +84,8 @@ void BlendPlan::Blend(Message* out, const Message& source, float t) const {
 }
 
 std::unique_ptr<BlendPlan::Node> BlendPlan::CompileNode(const Descriptor* type,
-                                                       const std::string& prefix,
-                                                       std::vector<const Descriptor*>* open) {
+                                                        const std::string& prefix,
+                                                        std::vector<const Descriptor*>* open) {
   using Kind = BlendPlan::Step::Kind;
   // The walk visits set extensions and every member of a oneof (setting the member it blends).
   if (type->extension_range_count() > 0 || type->real_oneof_decl_count() > 0) return nullptr;
@@ -100,8 +101,8 @@ std::unique_ptr<BlendPlan::Node> BlendPlan::CompileNode(const Descriptor* type,
     if (field->options().deprecated()) continue;
     std::string path = prefix.empty() ? field->name() : StrCat(prefix, ".", field->name());
     if (field->cpp_type() == FieldDescriptor::CPPTYPE_FLOAT) {
-      node->steps.push_back(
-          {field->is_repeated() ? Kind::kRepeatedFloat : Kind::kFloat, field, std::move(path), nullptr});
+      node->steps.push_back({field->is_repeated() ? Kind::kRepeatedFloat : Kind::kFloat, field,
+                             std::move(path), nullptr});
       continue;
     }
     if (!IsMessage(field)) continue;

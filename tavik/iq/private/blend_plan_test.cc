@@ -97,11 +97,17 @@ TEST(BlendPlanTest, EveryLeafPairOfTheSampleSetBlendsAsTheReflectionWalkDoes) {
 TEST(BlendPlanTest, SingularAndRepeatedFloatsBlendAsTwoProductsAndASum) {
   const auto out = ParseText<ClutStaticParam>(R"pb(
     yuv2rgb { matrix: [ 1, 2 ] }
-    input_lut { channel_index: 1 lut: [ 10, 20 ] }
+    input_lut {
+      channel_index: 1
+      lut: [ 10, 20 ]
+    }
   )pb");
   const auto source = ParseText<ClutStaticParam>(R"pb(
     yuv2rgb { matrix: [ 3, 6 ] }
-    input_lut { channel_index: 2 lut: [ 30, 60 ] }
+    input_lut {
+      channel_index: 2
+      lut: [ 30, 60 ]
+    }
   )pb");
   ClutStaticParam result = out;
   BlendPlan::ForGeneratedType(ClutStaticParam::descriptor())->Blend(&result, source, 0.5f);

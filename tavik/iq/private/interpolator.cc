@@ -70,8 +70,8 @@ void TraverseMessageInternal(Message* message, std::string* field_path,
       if (field->is_repeated()) {
         const int size = reflection->FieldSize(*message, field);
         for (int i = 0; i < size; ++i) {
-          TraverseMessageInternal(reflection->MutableRepeatedMessage(message, field, i),
-                                  field_path, path, visitor, i);
+          TraverseMessageInternal(reflection->MutableRepeatedMessage(message, field, i), field_path,
+                                  path, visitor, i);
           field_path->resize(with_dot);
         }
       } else if (reflection->HasField(*message, field)) {
@@ -94,7 +94,8 @@ const Message* FindMatchingMessage(const Message& root,
   for (size_t k = 0; k < path.size();) {
     const FieldDescriptor* field = path[k].field;
     if (field->containing_type() != current->GetDescriptor()) {
-      TAVIK_LOG(ERROR) << "field is not found: " << GetFieldPath(path.begin(), path.begin() + k + 1);
+      TAVIK_LOG(ERROR) << "field is not found: "
+                       << GetFieldPath(path.begin(), path.begin() + k + 1);
       return nullptr;
     }
     if (field->cpp_type() != FieldDescriptor::CPPTYPE_MESSAGE) break;
@@ -263,8 +264,8 @@ Status LinearInterpolateLevel(const vosbrine::Level& level, const vosbrine::Came
                               const PreparedTree* prepared, Message* out) {
   const auto& nodes = level.nodes();
   if (nodes.empty()) return InvalidArgumentError(StrCat("Empty level. ", out->GetTypeName()));
-  const std::optional<float> coordinate = CoordinateForLevel(level.type(),
-                                                             state.level_coordinates());
+  const std::optional<float> coordinate =
+      CoordinateForLevel(level.type(), state.level_coordinates());
   if (!coordinate.has_value()) return InvalidArgumentError("Unexpected node type.");
   const float x = *coordinate;
 
@@ -278,8 +279,7 @@ Status LinearInterpolateLevel(const vosbrine::Level& level, const vosbrine::Came
 
   const bool single_region = nodes[i].lower() <= x || i == 0;
   const vosbrine::Node& first = single_region ? nodes[i] : nodes[i - 1];
-  TAVIK_RETURN_IF_ERROR(
-      FillRegion(first, state, prepared, "Failed to Unpack first_region. ", out));
+  TAVIK_RETURN_IF_ERROR(FillRegion(first, state, prepared, "Failed to Unpack first_region. ", out));
   if (single_region) return OkStatus();
 
   // A prepared leaf is blended from where it lies; anything else is made in a message of its own.
@@ -303,9 +303,8 @@ Status LinearInterpolateLevel(const vosbrine::Level& level, const vosbrine::Came
   return OkStatus();
 }
 
-Status InterpolateTreeInternal(const vosbrine::TuningTree& tree,
-                               const vosbrine::CameraState& state, const PreparedTree* prepared,
-                               Message* out_dynamic_msg) {
+Status InterpolateTreeInternal(const vosbrine::TuningTree& tree, const vosbrine::CameraState& state,
+                               const PreparedTree* prepared, Message* out_dynamic_msg) {
   if (out_dynamic_msg == nullptr) return InvalidArgumentError("out_dynamic_msg is nullptr.");
   if (&tree == &vosbrine::TuningTree::default_instance() || !tree.has_dynamic_top_level()) {
     return InvalidArgumentError("Tree does not have dynamic_top_level.");
@@ -325,8 +324,8 @@ Status InterpolateTree(const PreparedTree& tree, const vosbrine::CameraState& st
   return InterpolateTreeInternal(tree.tree(), state, &tree, out_dynamic_msg);
 }
 
-bool LinearInterpolateMessage(const Message& msg1, const Message& msg2, float x1, float x2,
-                              float x, Message* out) {
+bool LinearInterpolateMessage(const Message& msg1, const Message& msg2, float x1, float x2, float x,
+                              Message* out) {
   return InterpolateMessages(msg1, msg2, x1, x2, x, nullptr, out);
 }
 

@@ -21,7 +21,7 @@ namespace tavik {
 
 // One step of the path from the root message to the field being visited.
 struct MutableTraversalPathNode {
-  google::protobuf::Message* message;           // The message that holds `field`.
+  google::protobuf::Message* message;  // The message that holds `field`.
   const google::protobuf::FieldDescriptor* field;
   // Index of `message` within the repeated field that holds it; unset when it is not a repeated
   // element. It therefore stands one node below the repeated field's own node.
@@ -30,10 +30,9 @@ struct MutableTraversalPathNode {
 
 // Called for every field; `field_path` is the dotted name of the field ("a.b"), `path` the nodes
 // from the root through this field. Returns whether to go into a message field.
-using MutableTraversalVisitor =
-    std::function<bool(const std::string* field_path, std::vector<MutableTraversalPathNode>* path,
-                       const google::protobuf::FieldDescriptor* field,
-                       google::protobuf::Message* message)>;
+using MutableTraversalVisitor = std::function<bool(
+    const std::string* field_path, std::vector<MutableTraversalPathNode>* path,
+    const google::protobuf::FieldDescriptor* field, google::protobuf::Message* message)>;
 
 // Evaluates `tree`'s dynamic levels at `state` into `out_dynamic_msg`, a message of the type that
 // the leaves pack. On failure `out_dynamic_msg` holds what was reached.

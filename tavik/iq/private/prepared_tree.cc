@@ -24,7 +24,8 @@ void PreparedTree::Unpack(const Any& packed) {
       google::protobuf::DescriptorPool::generated_pool()->FindMessageTypeByName(
           url.substr(slash + 1));
   if (type == nullptr) return;
-  const Message* prototype = google::protobuf::MessageFactory::generated_factory()->GetPrototype(type);
+  const Message* prototype =
+      google::protobuf::MessageFactory::generated_factory()->GetPrototype(type);
   if (prototype == nullptr) return;
   std::unique_ptr<Message> message(prototype->New());
   // As Any::UnpackTo parses.

@@ -154,8 +154,8 @@ WbDynamicParam Gains(float gain) {
 TEST(PreparedTreeTest, LeafThatDoesNotParseFailsWhenEvaluatedAsItAlwaysDid) {
   vosbrine::Node broken = LeafNode(10, 20, Gains(1));
   broken.mutable_dynamic_param()->set_value("\xff\xff\xff");
-  const TuningTree tree = MakeTree(
-      true, BlcStaticParam(), MakeLevel(Level::CCT, {LeafNode(0, 5, Gains(2)), broken}));
+  const TuningTree tree =
+      MakeTree(true, BlcStaticParam(), MakeLevel(Level::CCT, {LeafNode(0, 5, Gains(2)), broken}));
   const PreparedTree prepared(tree);
 
   WbDynamicParam out;

@@ -125,8 +125,7 @@ struct ZelTuningController::FrameTuning {
 struct ZelTuningController::BlockCache {
   BlockCache() {
     ForEachZelBlockType([this]<size_t Position, typename T>() {
-      fields[Position].emplace(T::descriptor(),
-                               vosbrine::zelmondrake::TuningTreeSet::descriptor());
+      fields[Position].emplace(T::descriptor(), vosbrine::zelmondrake::TuningTreeSet::descriptor());
     });
   }
 
@@ -366,7 +365,8 @@ StatusOr<std::shared_ptr<TuningBundle>> ZelTuningController::FillSubBlocksTuning
         frame.tree_set = provider_->FindPreparedTreeSet(usecase, /*fallback=*/true);
       }
       // A block that no bundle holds any more, refilled over its storage; or a new one.
-      std::shared_ptr<ZelTuningBlock<T>> fresh = std::get<Position>(block_cache_->block_pools).Acquire();
+      std::shared_ptr<ZelTuningBlock<T>> fresh =
+          std::get<Position>(block_cache_->block_pools).Acquire();
       // Production always takes the nearest use case. A failure is kept and the work goes on
       // with what the message holds; the block is cached all the same.
       const bool bypassed = IsSubBlockBypassed(point.tuning_info.bypass_bitmask, kName);

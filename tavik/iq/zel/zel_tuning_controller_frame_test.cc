@@ -55,7 +55,8 @@ TuningCoordinates At(float cct, float gain, float bv) {
 }
 
 const BlockNames& AllNames() {
-  static const BlockNames* const names = new BlockNames(kZelBlockNames.begin(), kZelBlockNames.end());
+  static const BlockNames* const names =
+      new BlockNames(kZelBlockNames.begin(), kZelBlockNames.end());
   return *names;
 }
 
