@@ -5,6 +5,9 @@
       One JSON object: the machine and the commit, then per benchmark its median time (ns), median
       CPU time, allocations per call and, where DIR holds callgrind counts, instructions per call;
       then the ratio of every benchmark to its floor (the benchmark of the same name + "Floor").
+  bench-summary.py readme SUMMARY_JSON README
+      Rewrites the part of README between "<!-- bench:begin -->" and "<!-- bench:end -->" with
+      the summary's tables: the machine, then each program's benchmarks and the ratios to floors.
   bench-summary.py callgrind RUN_JSON DUMP...
       Instructions per iteration of each benchmark of one run under callgrind: the dumps, in the
       order they were made, are matched to the benchmarks by their iteration counts.
@@ -133,9 +136,66 @@ def summarize(directory):
     print()
 
 
+def time_text(ns):
+    for unit, scale in (("s", 1e9), ("ms", 1e6), ("us", 1e3)):
+        if ns >= scale:
+            return f"{ns / scale:.3g} {unit}"
+    return f"{ns:.3g} ns"
+
+
+def number_text(value):
+    if value is None:
+        return ""
+    return f"{value:,.0f}" if value >= 100 else f"{value:.3g}"
+
+
+def readme(summary_path, readme_path):
+    summary = json.load(open(summary_path))
+    machine = summary["machine"]
+    lines = [
+        f"Measured by `scripts/bench.sh --callgrind` at commit {summary['commit']} on "
+        f"{machine['host']} ({machine['cpus']} cores at {machine['mhz_per_cpu']} MHz, load "
+        f"average {machine['load_avg'][0]:.1f} at the start of the last program), "
+        f"{machine['date']}. Times are medians of 5 repetitions (wall clock, then CPU); "
+        "instructions per call are callgrind's count, which the load of the machine does not "
+        "change.",
+        "",
+    ]
+    programs = []
+    for entry in summary["benchmarks"]:
+        if entry["program"] not in programs:
+            programs.append(entry["program"])
+    for program in programs:
+        lines += [f"`{program}`:", "",
+                  "| benchmark | time | CPU | allocs | instructions |", "|---|---|---|---|---|"]
+        for entry in summary["benchmarks"]:
+            if entry["program"] != program:
+                continue
+            lines.append(
+                f"| `{entry['name']}` | {time_text(entry['median_ns'])} | "
+                f"{time_text(entry['cpu_median_ns'])} | "
+                f"{number_text(entry.get('allocs_per_call'))} | "
+                f"{number_text(entry.get('instructions_per_call'))} |")
+        lines.append("")
+    for ratio in summary["ratios"]:
+        text = f"Ratio {ratio['name']}: {ratio['time']:.2f} in time, {ratio['cpu_time']:.2f} in CPU"
+        if "instructions" in ratio:
+            text += f", {ratio['instructions']:.2f} in instructions"
+        lines += [text + ".", ""]
+    text = open(readme_path).read()
+    begin, end = "<!-- bench:begin -->", "<!-- bench:end -->"
+    if begin not in text or end not in text:
+        sys.exit(f"{readme_path} has no {begin} ... {end} part")
+    head, rest = text.split(begin, 1)
+    tail = rest.split(end, 1)[1]
+    open(readme_path, "w").write(head + begin + "\n" + "\n".join(lines) + end + tail)
+
+
 def main():
     if len(sys.argv) >= 3 and sys.argv[1] == "summarize":
         summarize(sys.argv[2])
+    elif len(sys.argv) == 4 and sys.argv[1] == "readme":
+        readme(sys.argv[2], sys.argv[3])
     elif len(sys.argv) >= 3 and sys.argv[1] == "callgrind":
         callgrind(sys.argv[2], sys.argv[3:])
     else:

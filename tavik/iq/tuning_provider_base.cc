@@ -79,11 +79,12 @@ size_t CommonPrefixLength(const std::string& key, const std::string& wanted) {
 
 // Unpacks the first leaf that a depth-first walk finds and that unpacks into `out`.
 Status UnpackFirstLeaf(const Level& top_level, const tavik::PreparedTree& prepared, Message* out) {
+  const Descriptor* type = out->GetDescriptor();
   const auto* nodes = &top_level.nodes();
   for (int i = 0; i < nodes->size();) {
     const Node& node = (*nodes)[i];
     if (node.has_dynamic_param()) {
-      if (tavik::UnpackFromPrepared(node.dynamic_param(), &prepared, out)) {
+      if (tavik::UnpackFromPrepared(node.dynamic_param(), &prepared, type, out)) {
         return tavik::OkStatus();
       }
       ++i;
@@ -99,12 +100,12 @@ Status UnpackFirstLeaf(const Level& top_level, const tavik::PreparedTree& prepar
 
 // Makes a block message that may hold a former fill hold what a new message holds, but for the
 // static and dynamic parameters, which the fill clears or drops itself.
-void ResetForFill(const SubBlockFields& fields, Message* out) {
-  const google::protobuf::Reflection* reflection = out->GetReflection();
+void ResetForFill(const SubBlockFields& fields, const google::protobuf::Reflection* reflection,
+                  Message* out) {
   if (!reflection->GetUnknownFields(*out).empty()) {
     reflection->MutableUnknownFields(out)->Clear();
   }
-  const Descriptor* type = out->GetDescriptor();
+  const Descriptor* type = fields.block_type;
   for (int i = 0; i < type->field_count(); ++i) {
     const FieldDescriptor* field = type->field(i);
     if (field != fields.static_param && field != fields.dynamic_param) {
@@ -349,8 +350,7 @@ Status TuningProviderBase::FillSubBlockTuning(const TuningUsecase& usecase,
   }
   const tavik::PreparedTreeSet* tree_set = FindPreparedTreeSet(usecase, fallback);
   if (tree_set == nullptr) return tavik::NotFoundError("");
-  const SubBlockFields fields(sub_block_tuning->GetDescriptor(),
-                              tree_set->tree_set().GetDescriptor());
+  const SubBlockFields fields(sub_block_tuning->GetDescriptor(), tree_set->type());
   return FillSubBlockTuning(*tree_set, fields, usecase, camera_state, sub_block_tuning, bypassed);
 }
 
@@ -371,9 +371,8 @@ Status TuningProviderBase::FillSubBlockTuning(const tavik::PreparedTreeSet& tree
     return tavik::InvalidArgumentError("sub_block_tuning is nullptr.");
   }
   if (fields.block_type != sub_block_tuning->GetDescriptor() ||
-      fields.tree_set_type != tree_set.tree_set().GetDescriptor()) {
-    const SubBlockFields own_fields(sub_block_tuning->GetDescriptor(),
-                                    tree_set.tree_set().GetDescriptor());
+      fields.tree_set_type != tree_set.type()) {
+    const SubBlockFields own_fields(sub_block_tuning->GetDescriptor(), tree_set.type());
     return FillSubBlockTuning(tree_set, own_fields, usecase, camera_state, sub_block_tuning,
                               bypassed);
   }
@@ -381,7 +380,7 @@ Status TuningProviderBase::FillSubBlockTuning(const tavik::PreparedTreeSet& tree
   const google::protobuf::Reflection* reflection = out.GetReflection();
   // A former fill's submessages are kept for their storage; at every return below, the message
   // holds what a new one would, the submessages that a new one would not have made cleared away.
-  ResetForFill(fields, &out);
+  ResetForFill(fields, reflection, &out);
   auto drop_submessages_from = [&](const FieldDescriptor* first) {
     for (const FieldDescriptor* field : {fields.static_param, fields.dynamic_param}) {
       if (field == first) first = nullptr;
@@ -395,7 +394,7 @@ Status TuningProviderBase::FillSubBlockTuning(const tavik::PreparedTreeSet& tree
     TAVIK_LOG(ERROR) << "Field is not found: " << fields.tree_name;
   } else {
     tree = dynamic_cast<const TuningTree*>(
-        &tree_set.tree_set().GetReflection()->GetMessage(tree_set.tree_set(), fields.tree));
+        &tree_set.reflection()->GetMessage(tree_set.tree_set(), fields.tree));
   }
   if (tree == nullptr) {
     drop_submessages_from(fields.static_param);
@@ -416,7 +415,8 @@ Status TuningProviderBase::FillSubBlockTuning(const tavik::PreparedTreeSet& tree
   }
   Message* static_param = reflection->MutableMessage(&out, fields.static_param);
   static_param->Clear();
-  if (!tavik::UnpackFromPrepared(tree->static_param(), &prepared, static_param)) {
+  if (!tavik::UnpackFromPrepared(tree->static_param(), &prepared,
+                                 fields.static_param->message_type(), static_param)) {
     drop_submessages_from(fields.dynamic_param);
     return tavik::InternalError(StrCat("Failed to unpack static_param. ", usecase.DebugString()));
   }

@@ -203,69 +203,66 @@ std::optional<float> CoordinateForLevel(vosbrine::Level::Type type,
   }
 }
 
-Status LinearInterpolateLevel(const vosbrine::Level& level, const vosbrine::CameraState& state,
-                              const PreparedTree* prepared, Message* out);
+// What stays the same over one tree's evaluation: every message it fills is of one type.
+struct TreeEvaluation {
+  const vosbrine::CameraState& state;
+  const PreparedTree* prepared;  // Null for a tree evaluated as it is packed.
+  const Descriptor* type;
+  const BlendPlan* plan;  // Null where the reflection walk blends.
+};
+
+Status LinearInterpolateLevel(const vosbrine::Level& level, const TreeEvaluation& evaluation,
+                              Message* out);
 
 // Fills `out` from one region: its leaf, or the evaluation of its child level.
-Status FillRegion(const vosbrine::Node& node, const vosbrine::CameraState& state,
-                  const PreparedTree* prepared, std::string_view unpack_failure, Message* out) {
+Status FillRegion(const vosbrine::Node& node, const TreeEvaluation& evaluation,
+                  std::string_view unpack_failure, Message* out) {
   if (node.has_dynamic_param()) {
-    if (!UnpackFromPrepared(node.dynamic_param(), prepared, out)) {
+    if (!UnpackFromPrepared(node.dynamic_param(), evaluation.prepared, evaluation.type, out)) {
       return InvalidArgumentError(StrCat(unpack_failure, out->GetTypeName()));
     }
     return OkStatus();
   }
   // An unset oneof reads as an empty child level, which fails as such.
-  return LinearInterpolateLevel(node.child_level(), state, prepared, out);
+  return LinearInterpolateLevel(node.child_level(), evaluation, out);
 }
 
 bool SameType(const Message& a, const Message& b) {
   return a.GetDescriptor()->full_name() == b.GetDescriptor()->full_name();
 }
 
-// LinearInterpolateMessage, blending by `plan` when there is one and verbose logging, which only
-// the walk writes, is off.
-bool InterpolateMessages(const Message& msg1, const Message& msg2, float x1, float x2, float x,
-                         const BlendPlan* plan, Message* out) {
-  if (out == nullptr) {
-    TAVIK_LOG(ERROR) << "Output messages pointer is nullptr.";
-    return false;
-  }
-  if (!SameType(msg1, msg2) || !SameType(msg1, *out)) {
-    TAVIK_LOG(ERROR) << "Input and output messages are not the same type.";
-    return false;
-  }
-  out->CopyFrom(msg1);
+// The blend of LinearInterpolateMessage once its arguments are known good and `out` holds msg1:
+// by `plan` when there is one and verbose logging, whose lines only the walk writes, is off.
+void BlendIntoFirst(const Message& msg2, float x1, float x2, float x, const BlendPlan* plan,
+                    Message* out) {
   const float delta = x2 - x1;
   if (!(delta > kMinimumRegionGap)) {
     TAVIK_LOG(VERBOSE) << "x2 <= x1, no interpolation was done.";
-    return true;
+    return;
   }
   const float t = std::min(std::max((x - x1) / delta, 0.0f), 1.0f);
   if (!(t > 0.0f)) {
     TAVIK_LOG(VERBOSE) << "t <= 0.0, no interpolation was done. out = msg1.";
-    return true;
+    return;
   }
   if (!(t < 1.0f)) {
     out->CopyFrom(msg2);
     TAVIK_LOG(VERBOSE) << "t >= 1.0f, no interpolation was done. out = msg2.";
-    return true;
+    return;
   }
-  if (plan != nullptr && plan->type() == out->GetDescriptor() &&
-      !android::base::ShouldLog(android::base::VERBOSE, nullptr)) {
+  if (plan != nullptr && !android::base::ShouldLog(android::base::VERBOSE, nullptr)) {
     plan->Blend(out, msg2, t);
   } else {
     BlendMessagesByReflection(msg2, t, out);
   }
-  return true;
 }
 
-Status LinearInterpolateLevel(const vosbrine::Level& level, const vosbrine::CameraState& state,
-                              const PreparedTree* prepared, Message* out) {
+Status LinearInterpolateLevel(const vosbrine::Level& level, const TreeEvaluation& evaluation,
+                              Message* out) {
   const auto& nodes = level.nodes();
   if (nodes.empty()) return InvalidArgumentError(StrCat("Empty level. ", out->GetTypeName()));
   const std::optional<float> coordinate =
-      CoordinateForLevel(level.type(), state.level_coordinates());
+      CoordinateForLevel(level.type(), evaluation.state.level_coordinates());
   if (!coordinate.has_value()) return InvalidArgumentError("Unexpected node type.");
   const float x = *coordinate;
 
@@ -279,27 +276,26 @@ Status LinearInterpolateLevel(const vosbrine::Level& level, const vosbrine::Came
 
   const bool single_region = nodes[i].lower() <= x || i == 0;
   const vosbrine::Node& first = single_region ? nodes[i] : nodes[i - 1];
-  TAVIK_RETURN_IF_ERROR(FillRegion(first, state, prepared, "Failed to Unpack first_region. ", out));
+  TAVIK_RETURN_IF_ERROR(FillRegion(first, evaluation, "Failed to Unpack first_region. ", out));
   if (single_region) return OkStatus();
 
   // A prepared leaf is blended from where it lies; anything else is made in a message of its own.
+  // Either is of the type of `out`, and `out` holds the first region: LinearInterpolateMessage's
+  // checks would pass and its copy do nothing, so it could not fail with "Interpolation failed.
+  // Using first_region only. ", and its blend is all there is to do.
   const vosbrine::Node& second = nodes[i];
   const Message* second_message = nullptr;
   std::unique_ptr<Message> made;
-  if (prepared != nullptr && second.has_dynamic_param()) {
-    second_message = prepared->Unpacked(second.dynamic_param(), out->GetDescriptor());
+  if (evaluation.prepared != nullptr && second.has_dynamic_param()) {
+    second_message = evaluation.prepared->Unpacked(second.dynamic_param(), evaluation.type);
   }
   if (second_message == nullptr) {
     made.reset(out->New());
     TAVIK_RETURN_IF_ERROR(
-        FillRegion(second, state, prepared, "Failed to Unpack second_region. ", made.get()));
+        FillRegion(second, evaluation, "Failed to Unpack second_region. ", made.get()));
     second_message = made.get();
   }
-  const BlendPlan* plan = prepared == nullptr ? nullptr : prepared->PlanFor(out->GetDescriptor());
-  if (!InterpolateMessages(*out, *second_message, first.upper(), second.lower(), x, plan, out)) {
-    return InvalidArgumentError(
-        StrCat("Interpolation failed. Using first_region only. ", out->GetTypeName()));
-  }
+  BlendIntoFirst(*second_message, first.upper(), second.lower(), x, evaluation.plan, out);
   return OkStatus();
 }
 
@@ -309,7 +305,10 @@ Status InterpolateTreeInternal(const vosbrine::TuningTree& tree, const vosbrine:
   if (&tree == &vosbrine::TuningTree::default_instance() || !tree.has_dynamic_top_level()) {
     return InvalidArgumentError("Tree does not have dynamic_top_level.");
   }
-  return LinearInterpolateLevel(tree.dynamic_top_level(), state, prepared, out_dynamic_msg);
+  const Descriptor* type = out_dynamic_msg->GetDescriptor();
+  const TreeEvaluation evaluation{state, prepared, type,
+                                  prepared == nullptr ? nullptr : prepared->PlanFor(type)};
+  return LinearInterpolateLevel(tree.dynamic_top_level(), evaluation, out_dynamic_msg);
 }
 
 }  // namespace
@@ -326,7 +325,17 @@ Status InterpolateTree(const PreparedTree& tree, const vosbrine::CameraState& st
 
 bool LinearInterpolateMessage(const Message& msg1, const Message& msg2, float x1, float x2, float x,
                               Message* out) {
-  return InterpolateMessages(msg1, msg2, x1, x2, x, nullptr, out);
+  if (out == nullptr) {
+    TAVIK_LOG(ERROR) << "Output messages pointer is nullptr.";
+    return false;
+  }
+  if (!SameType(msg1, msg2) || !SameType(msg1, *out)) {
+    TAVIK_LOG(ERROR) << "Input and output messages are not the same type.";
+    return false;
+  }
+  out->CopyFrom(msg1);
+  BlendIntoFirst(msg2, x1, x2, x, nullptr, out);
+  return true;
 }
 
 void BlendMessagesByReflection(const Message& msg2, float t, Message* out) {

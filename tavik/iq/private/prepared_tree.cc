@@ -63,8 +63,13 @@ const BlendPlan* PreparedTree::PlanFor(const Descriptor* type) const {
 }
 
 bool UnpackFromPrepared(const Any& packed, const PreparedTree* prepared, Message* out) {
+  return UnpackFromPrepared(packed, prepared, out->GetDescriptor(), out);
+}
+
+bool UnpackFromPrepared(const Any& packed, const PreparedTree* prepared, const Descriptor* out_type,
+                        Message* out) {
   if (prepared != nullptr) {
-    if (const Message* unpacked = prepared->Unpacked(packed, out->GetDescriptor())) {
+    if (const Message* unpacked = prepared->Unpacked(packed, out_type)) {
       // Clears `out` first, as parsing does, and copies bit for bit. Not CopyFrom, which first
       // walks the whole source to check that it isn't part of `out`.
       out->Clear();
@@ -77,12 +82,14 @@ bool UnpackFromPrepared(const Any& packed, const PreparedTree* prepared, Message
 
 PreparedTreeSet::PreparedTreeSet(const Message& tree_set)
     : tree_set_(tree_set),
-      trees_(new std::atomic<const PreparedTree*>[tree_set.GetDescriptor()->field_count()]) {
-  for (int i = 0; i < tree_set.GetDescriptor()->field_count(); ++i) trees_[i] = nullptr;
+      type_(tree_set.GetDescriptor()),
+      reflection_(tree_set.GetReflection()),
+      trees_(new std::atomic<const PreparedTree*>[type_->field_count()]) {
+  for (int i = 0; i < type_->field_count(); ++i) trees_[i] = nullptr;
 }
 
 PreparedTreeSet::~PreparedTreeSet() {
-  for (int i = 0; i < tree_set_.GetDescriptor()->field_count(); ++i) delete trees_[i].load();
+  for (int i = 0; i < type_->field_count(); ++i) delete trees_[i].load();
 }
 
 const PreparedTree& PreparedTreeSet::Get(const FieldDescriptor* field,

@@ -53,6 +53,10 @@ class PreparedTree {
 // the same result and the same success, without parsing. `prepared` may be null.
 bool UnpackFromPrepared(const google::protobuf::Any& packed, const PreparedTree* prepared,
                         google::protobuf::Message* out);
+// The same, for a caller that knows `out_type`, the type of `out`.
+bool UnpackFromPrepared(const google::protobuf::Any& packed, const PreparedTree* prepared,
+                        const google::protobuf::Descriptor* out_type,
+                        google::protobuf::Message* out);
 
 // The prepared trees of one tree set, each made on its first use. Lock-free: threads that race on
 // a first use may each prepare the tree; one of them is kept and shared by all.
@@ -66,6 +70,9 @@ class PreparedTreeSet {
   PreparedTreeSet& operator=(const PreparedTreeSet&) = delete;
 
   const google::protobuf::Message& tree_set() const { return tree_set_; }
+  // The tree set's, found once: a frame asks for them for every block.
+  const google::protobuf::Descriptor* type() const { return type_; }
+  const google::protobuf::Reflection* reflection() const { return reflection_; }
 
   // The prepared tree of `tree`, the TuningTree held by the tree set's field `field`.
   const PreparedTree& Get(const google::protobuf::FieldDescriptor* field,
@@ -73,6 +80,8 @@ class PreparedTreeSet {
 
  private:
   const google::protobuf::Message& tree_set_;
+  const google::protobuf::Descriptor* const type_;
+  const google::protobuf::Reflection* const reflection_;
   // By field index.
   std::unique_ptr<std::atomic<const PreparedTree*>[]> trees_;
 };
