@@ -146,6 +146,8 @@ def time_text(ns):
 def number_text(value):
     if value is None:
         return ""
+    if value < 0.01:  # The one allocation of a benchmark's first pass, spread over its calls.
+        return "0"
     return f"{value:,.0f}" if value >= 100 else f"{value:.3g}"
 
 
@@ -153,7 +155,8 @@ def readme(summary_path, readme_path):
     summary = json.load(open(summary_path))
     machine = summary["machine"]
     lines = [
-        f"Measured by `scripts/bench.sh --callgrind` at commit {summary['commit']} on "
+        f"From the summary of `scripts/bench.sh` (instructions: `--callgrind`, where counted) at "
+        f"commit {summary['commit']} on "
         f"{machine['host']} ({machine['cpus']} cores at {machine['mhz_per_cpu']} MHz, load "
         f"average {machine['load_avg'][0]:.1f} at the start of the last program), "
         f"{machine['date']}. Times are medians of 5 repetitions (wall clock, then CPU); "
