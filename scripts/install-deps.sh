@@ -11,6 +11,7 @@ packages=(
   libeigen3-dev libfmt-dev
   libgtest-dev libgmock-dev libbenchmark-dev
   libplplot-dev plplot-driver-cairo
+  python3 valgrind
   clang-14 libclang-rt-14-dev
 )
 

@@ -4,6 +4,7 @@
 #include <sys/stat.h>
 
 #include <algorithm>
+#include <climits>
 #include <utility>
 
 #include "google/protobuf/dynamic_message.h"
@@ -46,14 +47,20 @@ std::string EnumName(const google::protobuf::EnumDescriptor* type, int number) {
   return value == nullptr ? std::string() : value->name();
 }
 
-// Takes one field name, not a path. Null (logged) when the field is absent or is no message.
-const FieldDescriptor* FindMessageField(const Message& message, const std::string& name) {
-  const FieldDescriptor* field = message.GetDescriptor()->FindFieldByName(name);
+// A singular message field of `type` named `name`, or null.
+const FieldDescriptor* FindSingularMessageField(const Descriptor* type, const std::string& name) {
+  const FieldDescriptor* field = type->FindFieldByName(name);
   if (field == nullptr || field->cpp_type() != FieldDescriptor::CPPTYPE_MESSAGE ||
       field->is_repeated()) {
-    TAVIK_LOG(ERROR) << "Field is not found: " << name;
     return nullptr;
   }
+  return field;
+}
+
+// Takes one field name, not a path. Null (logged) when the field is absent or is no message.
+const FieldDescriptor* FindMessageField(const Message& message, const std::string& name) {
+  const FieldDescriptor* field = FindSingularMessageField(message.GetDescriptor(), name);
+  if (field == nullptr) TAVIK_LOG(ERROR) << "Field is not found: " << name;
   return field;
 }
 
@@ -61,12 +68,6 @@ const Message* GetSubmessageByFieldPath(const Message& message, const std::strin
   const FieldDescriptor* field = FindMessageField(message, name);
   if (field == nullptr) return nullptr;
   return &message.GetReflection()->GetMessage(message, field);
-}
-
-Message* GetMutableSubmessageByFieldPath(Message* message, const std::string& name) {
-  const FieldDescriptor* field = FindMessageField(*message, name);
-  if (field == nullptr) return nullptr;
-  return message->GetReflection()->MutableMessage(message, field);
 }
 
 size_t CommonPrefixLength(const std::string& key, const std::string& wanted) {
@@ -77,12 +78,15 @@ size_t CommonPrefixLength(const std::string& key, const std::string& wanted) {
 }
 
 // Unpacks the first leaf that a depth-first walk finds and that unpacks into `out`.
-Status UnpackFirstLeaf(const Level& top_level, Message* out) {
+Status UnpackFirstLeaf(const Level& top_level, const tavik::PreparedTree& prepared, Message* out) {
+  const Descriptor* type = out->GetDescriptor();
   const auto* nodes = &top_level.nodes();
   for (int i = 0; i < nodes->size();) {
     const Node& node = (*nodes)[i];
     if (node.has_dynamic_param()) {
-      if (node.dynamic_param().UnpackTo(out)) return tavik::OkStatus();
+      if (tavik::UnpackFromPrepared(node.dynamic_param(), &prepared, type, out)) {
+        return tavik::OkStatus();
+      }
       ++i;
     } else if (node.has_child_level()) {
       nodes = &node.child_level().nodes();
@@ -94,7 +98,70 @@ Status UnpackFirstLeaf(const Level& top_level, Message* out) {
   return tavik::InternalError("First dynamic_param not found.");
 }
 
+// Makes a block message that may hold a former fill hold what a new message holds, but for the
+// static and dynamic parameters, which the fill clears or drops itself.
+void ResetForFill(const SubBlockFields& fields, const google::protobuf::Reflection* reflection,
+                  Message* out) {
+  if (!reflection->GetUnknownFields(*out).empty()) {
+    reflection->MutableUnknownFields(out)->Clear();
+  }
+  const Descriptor* type = fields.block_type;
+  for (int i = 0; i < type->field_count(); ++i) {
+    const FieldDescriptor* field = type->field(i);
+    if (field != fields.static_param && field != fields.dynamic_param) {
+      reflection->ClearField(out, field);
+    }
+  }
+}
+
+// An enum number as the key text sees it: every unknown number has the same, empty, name.
+int KeyNumber(const google::protobuf::EnumDescriptor* type, int number) {
+  return type->FindValueByNumber(number) == nullptr ? INT_MIN : number;
+}
+
+int KeyNumber(const google::protobuf::EnumDescriptor* type, std::string_view name) {
+  const google::protobuf::EnumValueDescriptor* value =
+      name.empty() ? nullptr : type->FindValueByName(std::string(name));
+  return value == nullptr ? INT_MIN : value->number();
+}
+
+// The key numbers of a key text that EncodeUsecaseKey made.
+std::tuple<int, int, int> KeyOfText(std::string_view key) {
+  constexpr std::string_view kSeparator = ", ";
+  std::string_view names[3];
+  for (int i = 0; i < 2; ++i) {
+    const size_t end = key.find(kSeparator);
+    if (end == std::string_view::npos) return {INT_MIN, INT_MIN, INT_MIN};
+    names[i] = key.substr(0, end);
+    key.remove_prefix(end + kSeparator.size());
+  }
+  names[2] = key;
+  return {KeyNumber(CameraSensor_descriptor(), names[0]),
+          KeyNumber(SensorMode_descriptor(), names[1]),
+          KeyNumber(CameraUsecase_descriptor(), names[2])};
+}
+
+std::tuple<int, int, int> ExactKey(const TuningUsecase& usecase) {
+  return {KeyNumber(CameraSensor_descriptor(), usecase.camera_sensor()),
+          KeyNumber(SensorMode_descriptor(), usecase.sensor_mode()),
+          KeyNumber(CameraUsecase_descriptor(), usecase.camera_usecase())};
+}
+
 }  // namespace
+
+SubBlockFields::SubBlockFields(const Descriptor* block, const Descriptor* tree_set)
+    : block_type(block),
+      tree_set_type(tree_set),
+      tree_name(FieldNameFromMessageName(block->full_name())),
+      tree(FindSingularMessageField(tree_set, tree_name)),
+      enable(block->FindFieldByName("enable")),
+      static_param(FindSingularMessageField(block, "static_param")),
+      dynamic_param(FindSingularMessageField(block, "dynamic_param")) {
+  if (enable != nullptr &&
+      (enable->cpp_type() != FieldDescriptor::CPPTYPE_BOOL || enable->is_repeated())) {
+    enable = nullptr;
+  }
+}
 
 std::string EncodeUsecaseKey(const TuningUsecase& usecase) {
   return StrCat(EnumName(CameraSensor_descriptor(), usecase.camera_sensor()), ", ",
@@ -219,6 +286,7 @@ Status TuningProviderBase::Load(const std::vector<std::string>& paths,
   }
 
   if (forest_.empty()) return tavik::InvalidArgumentError("No valid tuning binarypb.");
+  BuildLookupIndex();
   TAVIK_LOG(INFO) << "Tuning binarypb found: " << tuning_paths.size()
                   << " Tuning binarypb parsed: " << forest_.size()
                   << " Golden data binarypb found: " << golden_paths.size()
@@ -233,6 +301,7 @@ const Message* TuningProviderBase::GetTuningTreeSet(const TuningUsecase& usecase
     TAVIK_LOG(ERROR) << "TuningForestMap is empty.";
     return nullptr;
   }
+  if (const Message* exact = FindExactTreeSet(usecase)) return exact;
   const std::string key = EncodeUsecaseKey(usecase);
   const auto lower = forest_.lower_bound(key);
   if (lower != forest_.end() && lower->first == key) return lower->second.get();
@@ -251,9 +320,8 @@ const Message* TuningProviderBase::GetTuningTreeSet(const TuningUsecase& usecase
 }
 
 bool TuningProviderBase::HasTuningUsecase(const TuningUsecase& usecase) const {
-  const std::string key = EncodeUsecaseKey(usecase);
-  if (forest_.count(key) != 0) return true;
-  TAVIK_LOG(WARNING) << "Tuning_usecase not found: " << key;
+  if (FindExactTreeSet(usecase) != nullptr) return true;
+  TAVIK_LOG(WARNING) << "Tuning_usecase not found: " << EncodeUsecaseKey(usecase);
   return false;
 }
 
@@ -280,37 +348,101 @@ Status TuningProviderBase::FillSubBlockTuning(const TuningUsecase& usecase,
   if (sub_block_tuning == nullptr) {
     return tavik::InvalidArgumentError("sub_block_tuning is nullptr.");
   }
-  const Message* tree_set = GetTuningTreeSet(usecase, fallback);
+  const tavik::PreparedTreeSet* tree_set = FindPreparedTreeSet(usecase, fallback);
   if (tree_set == nullptr) return tavik::NotFoundError("");
-  const std::string field = FieldNameFromMessageName(sub_block_tuning->GetTypeName());
-  const auto* tree = dynamic_cast<const TuningTree*>(GetSubmessageByFieldPath(*tree_set, field));
-  if (tree == nullptr) {
-    return tavik::NotFoundError(StrCat(
-        "TuningUsecaseData does not contain the requested sub block tuning tree for ", field));
+  const SubBlockFields fields(sub_block_tuning->GetDescriptor(), tree_set->type());
+  return FillSubBlockTuning(*tree_set, fields, usecase, camera_state, sub_block_tuning, bypassed);
+}
+
+const tavik::PreparedTreeSet* TuningProviderBase::FindPreparedTreeSet(const TuningUsecase& usecase,
+                                                                      bool fallback) const {
+  const Message* tree_set = GetTuningTreeSet(usecase, fallback);
+  if (tree_set == nullptr) return nullptr;
+  const auto prepared = prepared_.find(tree_set);
+  return prepared == prepared_.end() ? nullptr : prepared->second.get();
+}
+
+Status TuningProviderBase::FillSubBlockTuning(const tavik::PreparedTreeSet& tree_set,
+                                              const SubBlockFields& fields,
+                                              const TuningUsecase& usecase,
+                                              const CameraState& camera_state,
+                                              Message* sub_block_tuning, bool bypassed) const {
+  if (sub_block_tuning == nullptr) {
+    return tavik::InvalidArgumentError("sub_block_tuning is nullptr.");
   }
+  if (fields.block_type != sub_block_tuning->GetDescriptor() ||
+      fields.tree_set_type != tree_set.type()) {
+    const SubBlockFields own_fields(sub_block_tuning->GetDescriptor(), tree_set.type());
+    return FillSubBlockTuning(tree_set, own_fields, usecase, camera_state, sub_block_tuning,
+                              bypassed);
+  }
+  Message& out = *sub_block_tuning;
+  const google::protobuf::Reflection* reflection = out.GetReflection();
+  // A former fill's submessages are kept for their storage; at every return below, the message
+  // holds what a new one would, the submessages that a new one would not have made cleared away.
+  ResetForFill(fields, reflection, &out);
+  auto drop_submessages_from = [&](const FieldDescriptor* first) {
+    for (const FieldDescriptor* field : {fields.static_param, fields.dynamic_param}) {
+      if (field == first) first = nullptr;
+      if (first == nullptr && field != nullptr) reflection->ClearField(&out, field);
+    }
+  };
+
+  const TuningTree* tree = nullptr;
+  if (fields.tree == nullptr) {
+    // The line of FindMessageField, which found nothing when the fields were resolved.
+    TAVIK_LOG(ERROR) << "Field is not found: " << fields.tree_name;
+  } else {
+    tree = dynamic_cast<const TuningTree*>(
+        &tree_set.reflection()->GetMessage(tree_set.tree_set(), fields.tree));
+  }
+  if (tree == nullptr) {
+    drop_submessages_from(fields.static_param);
+    return tavik::NotFoundError(
+        StrCat("TuningUsecaseData does not contain the requested sub block tuning tree for ",
+               fields.tree_name));
+  }
+  const tavik::PreparedTree& prepared = tree_set.Get(fields.tree, *tree);
 
   const bool enabled = !bypassed && tree->enable();
-  const FieldDescriptor* enable = sub_block_tuning->GetDescriptor()->FindFieldByName("enable");
-  if (enable != nullptr && enable->cpp_type() == FieldDescriptor::CPPTYPE_BOOL &&
-      !enable->is_repeated()) {
-    sub_block_tuning->GetReflection()->SetBool(sub_block_tuning, enable, enabled);
-  }
+  if (fields.enable != nullptr) reflection->SetBool(&out, fields.enable, enabled);
 
-  Message* static_param = GetMutableSubmessageByFieldPath(sub_block_tuning, "static_param");
-  if (static_param == nullptr) {
+  if (fields.static_param == nullptr) {
+    TAVIK_LOG(ERROR) << "Field is not found: static_param";
+    drop_submessages_from(fields.dynamic_param);
     return tavik::InvalidArgumentError(
         "Can't get mutable static_param message from output message.");
   }
-  if (!tree->static_param().UnpackTo(static_param)) {
+  Message* static_param = reflection->MutableMessage(&out, fields.static_param);
+  static_param->Clear();
+  if (!tavik::UnpackFromPrepared(tree->static_param(), &prepared,
+                                 fields.static_param->message_type(), static_param)) {
+    drop_submessages_from(fields.dynamic_param);
     return tavik::InternalError(StrCat("Failed to unpack static_param. ", usecase.DebugString()));
   }
-  Message* dynamic_param = GetMutableSubmessageByFieldPath(sub_block_tuning, "dynamic_param");
-  if (dynamic_param == nullptr) {
+  if (fields.dynamic_param == nullptr) {
+    TAVIK_LOG(ERROR) << "Field is not found: dynamic_param";
     return tavik::InvalidArgumentError(
         "Can't get mutable dynamic_param message from output message.");
   }
-  if (enabled) return tavik::InterpolateTree(*tree, camera_state, dynamic_param);
-  return UnpackFirstLeaf(tree->dynamic_top_level(), dynamic_param);
+  Message* dynamic_param = reflection->MutableMessage(&out, fields.dynamic_param);
+  dynamic_param->Clear();
+  if (enabled) return tavik::InterpolateTree(prepared, camera_state, dynamic_param);
+  return UnpackFirstLeaf(tree->dynamic_top_level(), prepared, dynamic_param);
+}
+
+void TuningProviderBase::BuildLookupIndex() {
+  exact_index_.clear();
+  prepared_.clear();
+  for (const auto& [key, tree_set] : forest_) {
+    exact_index_.try_emplace(KeyOfText(key), tree_set.get());
+    prepared_.try_emplace(tree_set.get(), std::make_unique<tavik::PreparedTreeSet>(*tree_set));
+  }
+}
+
+const Message* TuningProviderBase::FindExactTreeSet(const TuningUsecase& usecase) const {
+  const auto found = exact_index_.find(ExactKey(usecase));
+  return found == exact_index_.end() ? nullptr : found->second;
 }
 
 Status TuningProviderBase::FindMutableDynamicParams(Level* level,

@@ -9,6 +9,7 @@
 #include <memory>
 #include <string>
 #include <string_view>
+#include <tuple>
 #include <vector>
 
 #include "google/protobuf/any.pb.h"
@@ -16,6 +17,7 @@
 #include "tavik/base/containers.h"
 #include "tavik/base/status.h"
 #include "tavik/iq/export.h"
+#include "tavik/iq/private/prepared_tree.h"
 #include "tavik/iq/protos/camera_state.pb.h"
 #include "tavik/iq/protos/golden_sensor_factory_calibration_data.pb.h"
 #include "tavik/iq/protos/tuning_tree.pb.h"
@@ -43,6 +45,23 @@ TAVIK_EXPORT std::string FieldNameFromMessageName(std::string_view name);
 // Sensor first, then mode, so that the nearest key in sort order stays on the same sensor and mode
 // where it can. An unknown enum number gives an empty name.
 TAVIK_EXPORT std::string EncodeUsecaseKey(const TuningUsecase& usecase);
+
+// The fields that filling a block message uses, found by name once per block type: the block's
+// tree in the tree set (by FieldNameFromMessageName), and its "enable", "static_param" and
+// "dynamic_param". A null field is one the message or the tree set lacks; the fill reports it when
+// it needs it, as it would have on looking it up.
+struct SubBlockFields {
+  SubBlockFields(const google::protobuf::Descriptor* block_type,
+                 const google::protobuf::Descriptor* tree_set_type);
+
+  const google::protobuf::Descriptor* block_type;
+  const google::protobuf::Descriptor* tree_set_type;
+  std::string tree_name;
+  const google::protobuf::FieldDescriptor* tree;    // A singular message field of the tree set.
+  const google::protobuf::FieldDescriptor* enable;  // A singular bool.
+  const google::protobuf::FieldDescriptor* static_param;  // Singular messages.
+  const google::protobuf::FieldDescriptor* dynamic_param;
+};
 
 class TAVIK_EXPORT TuningProviderBase {
  public:
@@ -84,6 +103,22 @@ class TAVIK_EXPORT TuningProviderBase {
                                    google::protobuf::Message* sub_block_tuning, bool fallback,
                                    bool bypassed) const;
 
+  // The tree set that GetTuningTreeSet finds, with the trees prepared for evaluation (unpacked
+  // once, on first use). Null, logged, when nothing is found. For callers that fill several blocks
+  // of one use case: the search is done once.
+  const tavik::PreparedTreeSet* FindPreparedTreeSet(const TuningUsecase& usecase,
+                                                    bool fallback) const;
+
+  // FillSubBlockTuning on a tree set found beforehand, with the fields of the block's type found
+  // beforehand; `usecase` is the one the tree set was found for, named in failures. Same results,
+  // statuses and lines. `sub_block_tuning` may hold a former fill of its type, whose storage is
+  // reused: it ends as a new message would.
+  tavik::Status FillSubBlockTuning(const tavik::PreparedTreeSet& tree_set,
+                                   const SubBlockFields& fields, const TuningUsecase& usecase,
+                                   const CameraState& camera_state,
+                                   google::protobuf::Message* sub_block_tuning,
+                                   bool bypassed) const;
+
   // Every leaf of `level`, depth first in node order, for rewriting in place.
   static tavik::Status FindMutableDynamicParams(Level* level,
                                                 std::vector<google::protobuf::Any*>* dynamic_params);
@@ -91,7 +126,17 @@ class TAVIK_EXPORT TuningProviderBase {
   const TuningForestMap& forest() const { return forest_; }
 
  private:
+  // Rebuilds what lookups use beside the forest: the exact-key index and the prepared tree sets.
+  void BuildLookupIndex();
+  // The tree set whose key is exactly that of `usecase`, in time independent of the forest's
+  // size; null when there is none.
+  const google::protobuf::Message* FindExactTreeSet(const TuningUsecase& usecase) const;
+
   TuningForestMap forest_;
+  // The forest's keys as enum numbers, unknown numbers made one (they share the empty name).
+  tavik::FlatHashMap<std::tuple<int, int, int>, const google::protobuf::Message*> exact_index_;
+  tavik::FlatHashMap<const google::protobuf::Message*, std::unique_ptr<tavik::PreparedTreeSet>>
+      prepared_;
 };
 
 }  // namespace vosbrine

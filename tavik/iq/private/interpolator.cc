@@ -70,8 +70,8 @@ void TraverseMessageInternal(Message* message, std::string* field_path,
       if (field->is_repeated()) {
         const int size = reflection->FieldSize(*message, field);
         for (int i = 0; i < size; ++i) {
-          TraverseMessageInternal(reflection->MutableRepeatedMessage(message, field, i),
-                                  field_path, path, visitor, i);
+          TraverseMessageInternal(reflection->MutableRepeatedMessage(message, field, i), field_path,
+                                  path, visitor, i);
           field_path->resize(with_dot);
         }
       } else if (reflection->HasField(*message, field)) {
@@ -94,7 +94,8 @@ const Message* FindMatchingMessage(const Message& root,
   for (size_t k = 0; k < path.size();) {
     const FieldDescriptor* field = path[k].field;
     if (field->containing_type() != current->GetDescriptor()) {
-      TAVIK_LOG(ERROR) << "field is not found: " << GetFieldPath(path.begin(), path.begin() + k + 1);
+      TAVIK_LOG(ERROR) << "field is not found: "
+                       << GetFieldPath(path.begin(), path.begin() + k + 1);
       return nullptr;
     }
     if (field->cpp_type() != FieldDescriptor::CPPTYPE_MESSAGE) break;
@@ -121,18 +122,6 @@ const Message* FindMatchingMessage(const Message& root,
   return current;
 }
 
-// (1 - t) * a + t * b as two single-precision products and one sum. The library is built with
-// -ffp-contract=off, so the compiler may not fuse them into a multiply-add.
-inline float Blend(float a, float b, float t) {
-  const float weight_a = (1.0f - t) * a;
-  const float weight_b = t * b;
-  return weight_a + weight_b;
-}
-
-void BlendRepeatedFloats(float* out, const float* source, int size, float t) {
-  for (int i = 0; i < size; ++i) out[i] = Blend(out[i], source[i], t);
-}
-
 // The visitor of one blend: `out` is traversed, `msg2` followed along the same path.
 class BlendingVisitor {
  public:
@@ -157,8 +146,8 @@ class BlendingVisitor {
     const Reflection* reflection = message->GetReflection();
     if (!field->is_repeated()) {
       reflection->SetFloat(message, field,
-                           Blend(reflection->GetFloat(*message, field),
-                                 source->GetReflection()->GetFloat(*source, field), t_));
+                           BlendFloat(reflection->GetFloat(*message, field),
+                                      source->GetReflection()->GetFloat(*source, field), t_));
     } else {
       // The raw arrays let the inner loop vectorise; the field-ref API would cost a virtual call
       // per element.
@@ -173,8 +162,7 @@ class BlendingVisitor {
         TAVIK_LOG(ERROR) << "Mismatched sizes found at the repeated field " << *field_path;
         return false;
       }
-      BlendRepeatedFloats(out_values->mutable_data(), source_values.data(), out_values->size(),
-                          t_);
+      BlendFloats(out_values->mutable_data(), source_values.data(), out_values->size(), t_);
     }
     TAVIK_LOG(VERBOSE) << *field_path << " is interpolated.";
     return false;
@@ -215,28 +203,66 @@ std::optional<float> CoordinateForLevel(vosbrine::Level::Type type,
   }
 }
 
-Status LinearInterpolateLevel(const vosbrine::Level& level, const vosbrine::CameraState& state,
+// What stays the same over one tree's evaluation: every message it fills is of one type.
+struct TreeEvaluation {
+  const vosbrine::CameraState& state;
+  const PreparedTree* prepared;  // Null for a tree evaluated as it is packed.
+  const Descriptor* type;
+  const BlendPlan* plan;  // Null where the reflection walk blends.
+};
+
+Status LinearInterpolateLevel(const vosbrine::Level& level, const TreeEvaluation& evaluation,
                               Message* out);
 
 // Fills `out` from one region: its leaf, or the evaluation of its child level.
-Status FillRegion(const vosbrine::Node& node, const vosbrine::CameraState& state,
+Status FillRegion(const vosbrine::Node& node, const TreeEvaluation& evaluation,
                   std::string_view unpack_failure, Message* out) {
   if (node.has_dynamic_param()) {
-    if (!node.dynamic_param().UnpackTo(out)) {
+    if (!UnpackFromPrepared(node.dynamic_param(), evaluation.prepared, evaluation.type, out)) {
       return InvalidArgumentError(StrCat(unpack_failure, out->GetTypeName()));
     }
     return OkStatus();
   }
   // An unset oneof reads as an empty child level, which fails as such.
-  return LinearInterpolateLevel(node.child_level(), state, out);
+  return LinearInterpolateLevel(node.child_level(), evaluation, out);
 }
 
-Status LinearInterpolateLevel(const vosbrine::Level& level, const vosbrine::CameraState& state,
+bool SameType(const Message& a, const Message& b) {
+  return a.GetDescriptor()->full_name() == b.GetDescriptor()->full_name();
+}
+
+// The blend of LinearInterpolateMessage once its arguments are known good and `out` holds msg1:
+// by `plan` when there is one and verbose logging, whose lines only the walk writes, is off.
+void BlendIntoFirst(const Message& msg2, float x1, float x2, float x, const BlendPlan* plan,
+                    Message* out) {
+  const float delta = x2 - x1;
+  if (!(delta > kMinimumRegionGap)) {
+    TAVIK_LOG(VERBOSE) << "x2 <= x1, no interpolation was done.";
+    return;
+  }
+  const float t = std::min(std::max((x - x1) / delta, 0.0f), 1.0f);
+  if (!(t > 0.0f)) {
+    TAVIK_LOG(VERBOSE) << "t <= 0.0, no interpolation was done. out = msg1.";
+    return;
+  }
+  if (!(t < 1.0f)) {
+    out->CopyFrom(msg2);
+    TAVIK_LOG(VERBOSE) << "t >= 1.0f, no interpolation was done. out = msg2.";
+    return;
+  }
+  if (plan != nullptr && !android::base::ShouldLog(android::base::VERBOSE, nullptr)) {
+    plan->Blend(out, msg2, t);
+  } else {
+    BlendMessagesByReflection(msg2, t, out);
+  }
+}
+
+Status LinearInterpolateLevel(const vosbrine::Level& level, const TreeEvaluation& evaluation,
                               Message* out) {
   const auto& nodes = level.nodes();
   if (nodes.empty()) return InvalidArgumentError(StrCat("Empty level. ", out->GetTypeName()));
-  const std::optional<float> coordinate = CoordinateForLevel(level.type(),
-                                                             state.level_coordinates());
+  const std::optional<float> coordinate =
+      CoordinateForLevel(level.type(), evaluation.state.level_coordinates());
   if (!coordinate.has_value()) return InvalidArgumentError("Unexpected node type.");
   const float x = *coordinate;
 
@@ -250,59 +276,70 @@ Status LinearInterpolateLevel(const vosbrine::Level& level, const vosbrine::Came
 
   const bool single_region = nodes[i].lower() <= x || i == 0;
   const vosbrine::Node& first = single_region ? nodes[i] : nodes[i - 1];
-  TAVIK_RETURN_IF_ERROR(FillRegion(first, state, "Failed to Unpack first_region. ", out));
+  TAVIK_RETURN_IF_ERROR(FillRegion(first, evaluation, "Failed to Unpack first_region. ", out));
   if (single_region) return OkStatus();
 
+  // A prepared leaf is blended from where it lies; anything else is made in a message of its own.
+  // Either is of the type of `out`, and `out` holds the first region: LinearInterpolateMessage's
+  // checks would pass and its copy do nothing, so it could not fail with "Interpolation failed.
+  // Using first_region only. ", and its blend is all there is to do.
   const vosbrine::Node& second = nodes[i];
-  std::unique_ptr<Message> second_message(out->New());
-  TAVIK_RETURN_IF_ERROR(
-      FillRegion(second, state, "Failed to Unpack second_region. ", second_message.get()));
-  if (!LinearInterpolateMessage(*out, *second_message, first.upper(), second.lower(), x, out)) {
-    return InvalidArgumentError(
-        StrCat("Interpolation failed. Using first_region only. ", out->GetTypeName()));
+  const Message* second_message = nullptr;
+  std::unique_ptr<Message> made;
+  if (evaluation.prepared != nullptr && second.has_dynamic_param()) {
+    second_message = evaluation.prepared->Unpacked(second.dynamic_param(), evaluation.type);
   }
+  if (second_message == nullptr) {
+    made.reset(out->New());
+    TAVIK_RETURN_IF_ERROR(
+        FillRegion(second, evaluation, "Failed to Unpack second_region. ", made.get()));
+    second_message = made.get();
+  }
+  BlendIntoFirst(*second_message, first.upper(), second.lower(), x, evaluation.plan, out);
   return OkStatus();
+}
+
+Status InterpolateTreeInternal(const vosbrine::TuningTree& tree, const vosbrine::CameraState& state,
+                               const PreparedTree* prepared, Message* out_dynamic_msg) {
+  if (out_dynamic_msg == nullptr) return InvalidArgumentError("out_dynamic_msg is nullptr.");
+  if (&tree == &vosbrine::TuningTree::default_instance() || !tree.has_dynamic_top_level()) {
+    return InvalidArgumentError("Tree does not have dynamic_top_level.");
+  }
+  const Descriptor* type = out_dynamic_msg->GetDescriptor();
+  const TreeEvaluation evaluation{state, prepared, type,
+                                  prepared == nullptr ? nullptr : prepared->PlanFor(type)};
+  return LinearInterpolateLevel(tree.dynamic_top_level(), evaluation, out_dynamic_msg);
 }
 
 }  // namespace
 
 Status InterpolateTree(const vosbrine::TuningTree& tree, const vosbrine::CameraState& state,
                        Message* out_dynamic_msg) {
-  if (out_dynamic_msg == nullptr) return InvalidArgumentError("out_dynamic_msg is nullptr.");
-  if (&tree == &vosbrine::TuningTree::default_instance() || !tree.has_dynamic_top_level()) {
-    return InvalidArgumentError("Tree does not have dynamic_top_level.");
-  }
-  return LinearInterpolateLevel(tree.dynamic_top_level(), state, out_dynamic_msg);
+  return InterpolateTreeInternal(tree, state, nullptr, out_dynamic_msg);
 }
 
-bool LinearInterpolateMessage(const Message& msg1, const Message& msg2, float x1, float x2,
-                              float x, Message* out) {
+Status InterpolateTree(const PreparedTree& tree, const vosbrine::CameraState& state,
+                       Message* out_dynamic_msg) {
+  return InterpolateTreeInternal(tree.tree(), state, &tree, out_dynamic_msg);
+}
+
+bool LinearInterpolateMessage(const Message& msg1, const Message& msg2, float x1, float x2, float x,
+                              Message* out) {
   if (out == nullptr) {
     TAVIK_LOG(ERROR) << "Output messages pointer is nullptr.";
     return false;
   }
-  if (msg1.GetTypeName() != msg2.GetTypeName() || msg1.GetTypeName() != out->GetTypeName()) {
+  if (!SameType(msg1, msg2) || !SameType(msg1, *out)) {
     TAVIK_LOG(ERROR) << "Input and output messages are not the same type.";
     return false;
   }
   out->CopyFrom(msg1);
-  const float delta = x2 - x1;
-  if (!(delta > kMinimumRegionGap)) {
-    TAVIK_LOG(VERBOSE) << "x2 <= x1, no interpolation was done.";
-    return true;
-  }
-  const float t = std::min(std::max((x - x1) / delta, 0.0f), 1.0f);
-  if (!(t > 0.0f)) {
-    TAVIK_LOG(VERBOSE) << "t <= 0.0, no interpolation was done. out = msg1.";
-    return true;
-  }
-  if (!(t < 1.0f)) {
-    out->CopyFrom(msg2);
-    TAVIK_LOG(VERBOSE) << "t >= 1.0f, no interpolation was done. out = msg2.";
-    return true;
-  }
-  TraverseMutableMessageWithPath(out, BlendingVisitor(msg2, t));
+  BlendIntoFirst(msg2, x1, x2, x, nullptr, out);
   return true;
+}
+
+void BlendMessagesByReflection(const Message& msg2, float t, Message* out) {
+  TraverseMutableMessageWithPath(out, BlendingVisitor(msg2, t));
 }
 
 void TraverseMutableMessageWithPath(Message* message, const MutableTraversalVisitor& visitor) {

@@ -2,6 +2,13 @@
 
 namespace tavik {
 
+namespace {
+
+// Beyond this many names, a released bundle forgets them rather than keep empty slots.
+constexpr size_t kMaxEmptySlots = 64;
+
+}  // namespace
+
 const TuningBlock* ZelTuningBundle::GetBlock(std::string_view name) const {
   const auto found = blocks_.find(name);
   return found == blocks_.end() ? nullptr : found->second.get();
@@ -9,9 +16,27 @@ const TuningBlock* ZelTuningBundle::GetBlock(std::string_view name) const {
 
 Status ZelTuningBundle::AddBlock(std::shared_ptr<const TuningBlock> block) {
   if (block == nullptr) return InvalidArgumentError("Null tuning block");
-  std::string name = block->GetName();
-  blocks_.try_emplace(std::move(name), std::move(block));
+  const std::string name = block->GetName();
+  AddNamedBlock(name, std::move(block));
   return OkStatus();
+}
+
+void ZelTuningBundle::AddNamedBlock(std::string_view name,
+                                    std::shared_ptr<const TuningBlock> block) {
+  const auto found = blocks_.find(name);
+  if (found == blocks_.end()) {
+    blocks_.try_emplace(std::string(name), std::move(block));
+  } else if (found->second == nullptr) {
+    found->second = std::move(block);
+  }
+}
+
+void ZelTuningBundle::ReleaseBlocks() {
+  if (blocks_.size() > kMaxEmptySlots) {
+    blocks_.clear();
+    return;
+  }
+  for (auto& [name, block] : blocks_) block.reset();
 }
 
 ZelTuningPoint::ZelTuningPoint(UseCase use_case, TuningInfo tuning_info,

@@ -64,12 +64,23 @@ class TAVIK_EXPORT ZelTuningBundle : public TuningBundle {
  public:
   ZelTuningBundle() = default;
   // Room for `expected_blocks` without growing.
-  explicit ZelTuningBundle(size_t expected_blocks) { blocks_.reserve(expected_blocks); }
+  explicit ZelTuningBundle(size_t expected_blocks) { Reserve(expected_blocks); }
 
   const TuningBlock* GetBlock(std::string_view name) const override;
   Status AddBlock(std::shared_ptr<const TuningBlock> block) override;
 
+  // AddBlock of a non-null block whose name the caller knows to be `name`, without composing it.
+  void AddNamedBlock(std::string_view name, std::shared_ptr<const TuningBlock> block);
+
+  // Room for `expected_blocks` without growing.
+  void Reserve(size_t expected_blocks) { blocks_.reserve(expected_blocks); }
+
+  // Empties the bundle for another frame, letting its blocks go. The names stay as empty slots, so
+  // that a bundle filled with the same blocks again composes no text.
+  void ReleaseBlocks();
+
  private:
+  // An entry with a null block is an empty slot: absent to GetBlock and AddBlock.
   FlatHashMap<std::string, std::shared_ptr<const TuningBlock>> blocks_;
 };
 

@@ -340,6 +340,36 @@ TEST(ZelTuningBundleTest, OneBlockIsSharedBetweenBundles) {
   EXPECT_EQ(block.use_count(), 3);
 }
 
+TEST(ZelTuningBundleTest, NamedBlockIsAddedUnderTheNameGiven) {
+  ZelTuningBundle bundle;
+  const auto first = MakeBlock<zm::BlcTuning>(/*enable=*/true);
+  const auto second = MakeBlock<zm::BlcTuning>(/*enable=*/false);
+  bundle.AddNamedBlock("BlcTuning", first);
+  bundle.AddNamedBlock("BlcTuning", second);
+  EXPECT_EQ(bundle.GetBlock("BlcTuning"), first.get());
+  // And the name rule of AddBlock holds across both.
+  EXPECT_THAT(bundle.AddBlock(second), IsOk());
+  EXPECT_EQ(bundle.GetBlock("BlcTuning"), first.get());
+}
+
+TEST(ZelTuningBundleTest, ReleasedBundleIsEmptyAndLetsItsBlocksGo) {
+  ZelTuningBundle bundle;
+  auto blc = MakeBlock<zm::BlcTuning>();
+  const std::weak_ptr<const ZelTuningBlock<zm::BlcTuning>> watch = blc;
+  ASSERT_THAT(bundle.AddBlock(std::move(blc)), IsOk());
+  bundle.ReleaseBlocks();
+  EXPECT_EQ(bundle.GetBlock("BlcTuning"), nullptr);
+  EXPECT_TRUE(watch.expired());
+
+  // Filled again, it holds the new blocks; the old name's slot takes a block as if it were new.
+  const auto again = MakeBlock<zm::BlcTuning>(/*enable=*/false);
+  const auto dpc = MakeBlock<zm::DpcTuning>();
+  EXPECT_THAT(bundle.AddBlock(again), IsOk());
+  bundle.AddNamedBlock("DpcTuning", dpc);
+  EXPECT_EQ(bundle.GetBlock("BlcTuning"), again.get());
+  EXPECT_EQ(bundle.GetBlock("DpcTuning"), dpc.get());
+}
+
 TEST(ZelTuningBundleTest, HoldsAllTwentyFiveBlocks) {
   ZelTuningBundle bundle;
   ASSERT_THAT(bundle.AddBlock(MakeBlock<zm::BlcTuning>()), IsOk());

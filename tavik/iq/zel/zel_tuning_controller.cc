@@ -7,12 +7,16 @@
 
 #include <array>
 #include <cstring>
+#include <optional>
 #include <tuple>
+#include <typeinfo>
 #include <utility>
 
 #include "tavik/base/logging.h"
+#include "tavik/base/recycling_pool.h"
 #include "tavik/base/strings.h"
 #include "tavik/base/system_properties.h"
+#include "tavik/iq/zel/protos/tuning_tree_set.pb.h"
 #include "tavik/iq/zel/sensor_eeprom_data.h"
 #include "tavik/iq/zel/zel_block_list.h"
 #include "tavik/iq/zel/zel_tuning_controller_util.h"
@@ -25,6 +29,10 @@ constexpr char kEnableSensorBringupTuningProperty[] =
     "vendor.camera.debug.enable_sensor_bringup_tuning";
 constexpr char kDumpSensorEepromDataProperty[] = "vendor.camera.debug.dump_sensor_eeprom_data";
 constexpr int kWarningPeriodSeconds = 5;
+// Bundles and blocks in flight at once: the frames that the pipeline holds, and a few more. Beyond
+// these, idle ones are freed rather than kept.
+constexpr size_t kIdleBundles = 32;
+constexpr size_t kIdleBlocksPerPosition = 8;
 // The signal thread runs in the normal scheduling class, niced up so that fences fire promptly.
 constexpr int kSignalThreadNice = -10;
 
@@ -65,6 +73,28 @@ bool UseCaseFieldsDiffer(const ZelTuningPoint& a, const ZelTuningPoint& b) {
          mode_a.target_fps_range != mode_b.target_fps_range;
 }
 
+// The fields of two points that the use-case mapping reads (and a few it doesn't, which costs only
+// a mapping now and then).
+bool MappingInputsEqual(const ZelTuningPoint& a, const ZelTuningPoint& b) {
+  const TuningSensorModeInfo& mode_a = a.tuning_info.sensor_mode_info;
+  const TuningSensorModeInfo& mode_b = b.tuning_info.sensor_mode_info;
+  return a.use_bringup_tuning == b.use_bringup_tuning && a.use_case == b.use_case &&
+         mode_a.sensor_name == mode_b.sensor_name && mode_a.mode_width == mode_b.mode_width &&
+         mode_a.mode_height == mode_b.mode_height && mode_a.binning_x == mode_b.binning_x &&
+         mode_a.binning_y == mode_b.binning_y &&
+         mode_a.sensor_fps_range == mode_b.sensor_fps_range &&
+         mode_a.target_fps_range == mode_b.target_fps_range &&
+         a.tuning_info.image_size == b.tuning_info.image_size &&
+         a.tuning_info.module_spec == b.tuning_info.module_spec;
+}
+
+// A ZelTuningPoint, or null for a point of another class. The exact class is told apart by its
+// type alone, which is much cheaper than a cast through the hierarchy.
+const ZelTuningPoint* AsZelTuningPoint(const TuningPoint& point) {
+  if (typeid(point) == typeid(ZelTuningPoint)) return static_cast<const ZelTuningPoint*>(&point);
+  return dynamic_cast<const ZelTuningPoint*>(&point);
+}
+
 // With `!=` on each value, so that a NaN coordinate always counts as changed.
 bool CoordinatesDiffer(const TuningCoordinates& a, const TuningCoordinates& b) {
   return a.led_influence != b.led_influence || a.cct != b.cct || a.bv != b.bv ||
@@ -78,10 +108,40 @@ bool CoordinatesDiffer(const TuningCoordinates& a, const TuningCoordinates& b) {
 template <typename T>
 using SharedBlock = std::shared_ptr<const ZelTuningBlock<T>>;
 
-// The latest block of each position, and a copy of the point it was made for.
+// Blocks of one position come back here when the last bundle holding them goes, and are filled
+// again over the storage they kept.
+template <typename T>
+struct BlockPool : RecyclingPool<ZelTuningBlock<T>> {
+  BlockPool() : RecyclingPool<ZelTuningBlock<T>>(kIdleBlocksPerPosition) {}
+};
+
+// What a frame's blocks are made from: the use case and, once a block needs it, its tree set.
+struct ZelTuningController::FrameTuning {
+  vosbrine::TuningUsecase usecase;
+  const PreparedTreeSet* tree_set = nullptr;
+};
+
+// The latest block of each position, and a copy of the point it was made for; the storage that
+// frames reuse; and the last frame's use case.
 struct ZelTuningController::BlockCache {
+  BlockCache() {
+    ForEachZelBlockType([this]<size_t Position, typename T>() {
+      fields[Position].emplace(T::descriptor(), vosbrine::zelmondrake::TuningTreeSet::descriptor());
+    });
+  }
+
   ZelBlockTuple<SharedBlock> blocks;
   std::array<std::unique_ptr<ZelTuningPoint>, kZelBlockCount> points;
+
+  ZelBlockTuple<BlockPool> block_pools;
+  RecyclingPool<ZelTuningBundle> bundles{kIdleBundles,
+                                         [](ZelTuningBundle& bundle) { bundle.ReleaseBlocks(); }};
+  std::array<std::optional<vosbrine::SubBlockFields>, kZelBlockCount> fields;
+
+  // The last point whose use case mapped as it stands, and what it mapped to.
+  std::mutex frame_mutex;
+  std::unique_ptr<ZelTuningPoint> frame_point;
+  FrameTuning frame_tuning;
 };
 
 bool IsSubBlockBypassed(uint32_t bypass_bitmask, std::string_view block_name) {
@@ -131,31 +191,64 @@ std::shared_ptr<TuningPoint> ZelTuningController::CreateTuningPoint(
 
 StatusOr<std::shared_ptr<vosbrine::TuningUsecase>> ZelTuningController::GenerateTuningUseCase(
     const ZelTuningPoint& point, std::string_view device_name) const {
-  auto usecase = std::make_shared<vosbrine::TuningUsecase>(DefaultTuningUsecase());
-  if (point.use_bringup_tuning) return usecase;
+  auto usecase = std::make_shared<vosbrine::TuningUsecase>();
+  MapTuningUseCase(point, device_name, usecase.get());
+  return usecase;
+}
+
+bool ZelTuningController::MapTuningUseCase(const ZelTuningPoint& point,
+                                           std::string_view device_name,
+                                           vosbrine::TuningUsecase* usecase) const {
+  *usecase = DefaultTuningUsecase();
+  if (point.use_bringup_tuning) return true;
   // One part that can't be mapped discards the others: the default is taken whole.
   const vosbrine::CameraSensor sensor = ConvertToCameraSensor(
       device_name, point.tuning_info.sensor_mode_info.sensor_name, point.tuning_info.module_spec);
   if (sensor == vosbrine::INVALID_CAMERA_SENSOR) {
     TAVIK_LOG_EVERY_N_SEC(WARNING, kWarningPeriodSeconds) << "INVALID_CAMERA_SENSOR. Using default";
-    return usecase;
+    return false;
   }
   const vosbrine::SensorMode mode = ConvertToSensorMode(
       point.tuning_info.sensor_mode_info, point.tuning_info.image_size, point.use_case);
   if (mode == vosbrine::INVALID_SENSOR_MODE) {
     TAVIK_LOG_EVERY_N_SEC(WARNING, kWarningPeriodSeconds) << "INVALID_SENSOR_MODE. Using default";
-    return usecase;
+    return false;
   }
   const vosbrine::CameraUsecase camera_usecase = ConvertToCameraUseCase(point.use_case);
   if (camera_usecase == vosbrine::INVALID_CAMERA_USECASE) {
     TAVIK_LOG_EVERY_N_SEC(WARNING, kWarningPeriodSeconds)
         << "INVALID_CAMERA_USECASE. Using default";
-    return usecase;
+    return false;
   }
   usecase->set_camera_sensor(sensor);
   usecase->set_sensor_mode(mode);
   usecase->set_camera_usecase(camera_usecase);
-  return usecase;
+  return true;
+}
+
+ZelTuningController::FrameTuning ZelTuningController::GetFrameTuning(
+    const ZelTuningPoint& point) const {
+  {
+    std::lock_guard<std::mutex> lock(block_cache_->frame_mutex);
+    if (block_cache_->frame_point != nullptr &&
+        MappingInputsEqual(point, *block_cache_->frame_point)) {
+      return block_cache_->frame_tuning;
+    }
+  }
+  FrameTuning frame;
+  // A point that falls back to the default use case is mapped afresh each time, so that its
+  // (rate-limited) warnings are logged as they always were.
+  if (!MapTuningUseCase(point, device_name_, &frame.usecase)) return frame;
+  // Production always takes the nearest use case, which never fails on a loaded forest.
+  frame.tree_set = provider_->FindPreparedTreeSet(frame.usecase, /*fallback=*/true);
+  std::lock_guard<std::mutex> lock(block_cache_->frame_mutex);
+  if (block_cache_->frame_point == nullptr) {
+    block_cache_->frame_point = std::make_unique<ZelTuningPoint>(point);
+  } else {
+    *block_cache_->frame_point = point;
+  }
+  block_cache_->frame_tuning = frame;
+  return frame;
 }
 
 StatusOr<bool> ZelTuningController::IsBlockEnabled(const TuningPoint& point,
@@ -183,8 +276,8 @@ StatusOr<bool> ZelTuningController::IsBlockEnabled(const TuningPoint& point,
 
 StatusOr<bool> ZelTuningController::IsTuningPointUpdated(const TuningPoint& a,
                                                          const TuningPoint& b) const {
-  const auto* point_a = dynamic_cast<const ZelTuningPoint*>(&a);
-  const auto* point_b = dynamic_cast<const ZelTuningPoint*>(&b);
+  const ZelTuningPoint* point_a = AsZelTuningPoint(a);
+  const ZelTuningPoint* point_b = AsZelTuningPoint(b);
   if (point_a == nullptr || point_b == nullptr) {
     return InvalidArgumentError("Invalid tuning point");
   }
@@ -217,15 +310,10 @@ StatusOr<std::shared_ptr<TuningBundle>> ZelTuningController::Interpolate(
 
 StatusOr<std::shared_ptr<TuningBundle>> ZelTuningController::FillSubBlocksTuning(
     const ZelTuningPoint& point, const FlatHashSet<std::string_view>& block_names) const {
-  StatusOr<std::shared_ptr<vosbrine::TuningUsecase>> usecase_or =
-      GenerateTuningUseCase(point, device_name_);
-  if (!usecase_or.ok()) return usecase_or.status();
-  const vosbrine::TuningUsecase& usecase = **usecase_or;
-  const vosbrine::CameraState state = ConvertToCameraState(point);
-
-  // Every position's message is made, requested or not, so that a position's work is the same
-  // whatever else the frame asks for.
-  ZelBlockTuple<ZelTuningBlock> stack_blocks;
+  FrameTuning frame = GetFrameTuning(point);
+  const vosbrine::TuningUsecase& usecase = frame.usecase;
+  // Made at the first block that is evaluated: a frame served from the cache needs no state.
+  std::optional<vosbrine::CameraState> state;
 
   std::array<bool, kZelBlockCount> requested{};
   for (std::string_view name : block_names) {
@@ -236,13 +324,15 @@ StatusOr<std::shared_ptr<TuningBundle>> ZelTuningController::FillSubBlocksTuning
     requested[position->second] = true;
   }
 
-  auto bundle = std::make_shared<ZelTuningBundle>(block_names.size());
+  std::shared_ptr<ZelTuningBundle> bundle = block_cache_->bundles.Acquire();
+  bundle->Reserve(block_names.size());
   Status first_failure;
   auto keep_first = [&first_failure](const Status& status) {
     if (!status.ok() && first_failure.ok()) first_failure = status;
   };
   ForEachZelBlockType([&]<size_t Position, typename T>() {
     if (!requested[Position]) return;
+    constexpr std::string_view kName = kZelBlockNames[Position];
     std::lock_guard<std::mutex> lock(block_cache_mutex_);
     SharedBlock<T>& cached_block = std::get<Position>(block_cache_->blocks);
     std::unique_ptr<ZelTuningPoint>& cached_point = block_cache_->points[Position];
@@ -252,22 +342,36 @@ StatusOr<std::shared_ptr<TuningBundle>> ZelTuningController::FillSubBlocksTuning
       if (updated.ok() && !*updated) block = cached_block;
     }
     if (block == nullptr) {
-      ZelTuningBlock<T>& stack_block = std::get<Position>(stack_blocks);
+      if (!state.has_value()) state = ConvertToCameraState(point);
+      if (frame.tree_set == nullptr) {
+        frame.tree_set = provider_->FindPreparedTreeSet(usecase, /*fallback=*/true);
+      }
+      // A block that no bundle holds any more, refilled over its storage; or a new one.
+      std::shared_ptr<ZelTuningBlock<T>> fresh =
+          std::get<Position>(block_cache_->block_pools).Acquire();
       // Production always takes the nearest use case. A failure is kept and the work goes on
       // with what the message holds; the block is cached all the same.
-      keep_first(provider_->FillSubBlockTuning(
-          usecase, state, &stack_block.message, /*fallback=*/true,
-          IsSubBlockBypassed(point.tuning_info.bypass_bitmask, stack_block.GetName())));
+      const bool bypassed = IsSubBlockBypassed(point.tuning_info.bypass_bitmask, kName);
+      if (frame.tree_set != nullptr) {
+        keep_first(provider_->FillSubBlockTuning(*frame.tree_set, *block_cache_->fields[Position],
+                                                 usecase, *state, &fresh->message, bypassed));
+      } else {
+        fresh->message.Clear();
+        keep_first(provider_->FillSubBlockTuning(usecase, *state, &fresh->message,
+                                                 /*fallback=*/true, bypassed));
+      }
       if (cached_point == nullptr || UseCaseFieldsDiffer(point, *cached_point)) {
         TAVIK_LOG(VERBOSE) << "Tuning usecase is updated: " << UsecaseText(usecase);
       }
-      auto fresh = std::make_shared<ZelTuningBlock<T>>();
-      fresh->message.Swap(&stack_block.message);
       cached_block = fresh;
       block = std::move(fresh);
-      cached_point = std::make_unique<ZelTuningPoint>(point);
+      if (cached_point == nullptr) {
+        cached_point = std::make_unique<ZelTuningPoint>(point);
+      } else {
+        *cached_point = point;
+      }
     }
-    keep_first(bundle->AddBlock(std::move(block)));
+    bundle->AddNamedBlock(kName, std::move(block));
   });
   if (!first_failure.ok()) return first_failure;
   return std::shared_ptr<TuningBundle>(std::move(bundle));

@@ -81,6 +81,15 @@ class TAVIK_EXPORT ZelTuningController : public TuningController {
 
  private:
   struct BlockCache;
+  struct FrameTuning;
+
+  // The use case of the point into `usecase`, as GenerateTuningUseCase gives it. Returns whether
+  // the point mapped as it stands (or asked for bring-up): true when nothing was logged.
+  bool MapTuningUseCase(const ZelTuningPoint& point, std::string_view device_name,
+                        vosbrine::TuningUsecase* usecase) const;
+  // The use case of the point and the tree set it takes, from the last frame's when the point's
+  // description is the same, for the cost of a comparison.
+  FrameTuning GetFrameTuning(const ZelTuningPoint& point) const;
 
   StatusOr<std::shared_ptr<TuningBundle>> FillSubBlocksTuning(
       const ZelTuningPoint& point, const FlatHashSet<std::string_view>& block_names) const;
